@@ -1,0 +1,215 @@
+#include "engine/record_store.h"
+
+#include <algorithm>
+#include <cstdio>
+
+#include "engine/byte_order.h"
+#include "platform/file_io.h"
+
+namespace cx {
+
+DataRecord::DataRecord(Bytes bytes, uint8_t attributes, uint32_t uniqueID)
+    : attributes_(attributes), uniqueID_(uniqueID) {
+  SetBytes(std::move(bytes));
+}
+
+void DataRecord::SetBytes(Bytes bytes) {
+  auto block = std::make_shared<const Bytes>(std::move(bytes));
+  data_ = block->data();
+  size_ = static_cast<uint32_t>(block->size());
+  owned_ = std::move(block);
+}
+
+std::string FormatMessage(const char* pattern, const std::string& text) {
+  std::string out = pattern;
+  size_t at = out.find("%s");
+  if (at != std::string::npos) out.replace(at, 2, text);
+  return out;
+}
+
+std::string FormatMessage(const char* pattern, long number) {
+  std::string out = pattern;
+  size_t at = out.find("%d");
+  if (at != std::string::npos) out.replace(at, 2, std::to_string(number));
+  return out;
+}
+
+Database::Database() : schema_(InitSchema()) {}
+
+Database Database::CreateNew(const std::string& path, const std::string& name) {
+  Database db;
+  db.path_ = path;
+  db.header_ = InitHeader(name);
+  db.schema_ = InitSchema();
+  return db;
+}
+
+Status Database::Open(const std::string& path, UiPort& ui) {
+  auto fail = [&ui](std::string message) {
+    ui.SetBusy(false);
+    ui.ShowMessage(message, "Error", MessageIcon::Error);
+    return Status::Error(std::move(message));
+  };
+
+  auto image = std::make_shared<Bytes>();
+  if (!ReadWholeFile(path, *image)) return fail(FormatMessage(messages::kCannotOpen, path));
+  if (image->size() < format::kHeaderSize) return fail(messages::kBadHeader);
+  Database db;
+  db.path_ = path;
+  db.header_ = DecodeHeader(image->data());
+  if (db.header_.creator != format::kCreator) return fail(messages::kBadHeader);
+
+  RecordReader reader;
+  if (!reader.Open(image, db.header_.numRecords)) return fail(messages::kCannotInit);
+
+  ByteView bytes;
+  uint8_t attributes = 0;
+  uint32_t uniqueID = 0;
+  if (!reader.Next(bytes, attributes, uniqueID) || !ReadSchema(bytes, db.schema_)) {
+    return fail(messages::kCannotReadSchema);
+  }
+  db.schemaAttributes_ = attributes;
+  db.schemaUniqueID_ = uniqueID;
+
+  for (int i = 0; i < format::kPopupRecords; ++i) {
+    if (reader.index() >= reader.count()) break;
+    if (reader.Next(bytes, attributes, uniqueID)) {
+      db.popups_[i] = DecodePopupList(bytes, attributes, uniqueID);
+    } else {
+      // An unreadable list stays empty, but its entry is kept.
+      const RecordEntry& e = reader.entries()[reader.index() - 1];
+      db.popups_[i].attributes = e.attributes;
+      db.popups_[i].uniqueID = e.uniqueID;
+    }
+  }
+
+  const size_t dataCount =
+      db.header_.numRecords > format::kFirstDataRecord ? db.header_.numRecords - format::kFirstDataRecord : 0;
+  db.records_.reserve(dataCount);
+  for (size_t n = 0; n < dataCount; ++n) {
+    if (!reader.Next(bytes, attributes, uniqueID)) {
+      ui.SetBusy(false);
+      ui.ShowMessage(FormatMessage(messages::kCannotReadRecord, static_cast<long>(n)), "Error",
+                     MessageIcon::Error);
+      db.partial_ = true;
+      break;
+    }
+    if (!RecordIsWellFormed(bytes)) ++db.malformed_;
+    db.records_.emplace_back(bytes, attributes, uniqueID);
+  }
+  if (db.malformed_) {
+    ui.ShowMessage(std::to_string(db.malformed_) +
+                       " record(s) hold values that run past the end of the record; those "
+                       "values are shown cut short and are kept as they are unless edited.",
+                   "Error", MessageIcon::Warning);
+  }
+  db.image_ = std::move(image);
+  *this = std::move(db);
+  return Status::Ok();
+}
+
+Status Database::Save(const Clock& clock) { return SaveAs(path_, clock); }
+
+Status Database::SaveAs(const std::string& target, const Clock& clock) {
+  if (partial_ && target == path_) {
+    return Status::Error(
+        "ERROR: This database could only be read in part.\nSave it under another name so that "
+        "the original file is kept.");
+  }
+  const size_t numRecords = format::kFirstDataRecord + records_.size();
+  if (numRecords > format::kMaxFileRecords) return Status::Error("ERROR: Too many records to save");
+
+  Header header = header_;
+  header.numRecords = static_cast<uint16_t>(numRecords);
+  header.appInfoID = static_cast<uint32_t>(80 + format::kEntrySize * numRecords);
+  int64_t now = clock.Now() + (clock.DaylightSaving() ? 3600 : 0);
+  header.modificationDate = static_cast<uint32_t>(now);
+
+  const Bytes schemaBytes = WriteSchema(schema_);
+  std::array<Bytes, format::kPopupRecords> popupBytes;
+  for (int i = 0; i < format::kPopupRecords; ++i) popupBytes[i] = popups_[i].Encode();
+
+  // Entry list, built in one block.
+  Bytes head(format::kHeaderSize + format::kEntrySize * numRecords + format::kGapSize +
+                 format::kAppInfoSize,
+             0);
+  EncodeHeader(header, head.data());
+  uint64_t offset = header.appInfoID + format::kAppInfoSize;
+  uint8_t* entry = head.data() + format::kHeaderSize;
+  auto putEntry = [&](uint8_t attributes, uint32_t uniqueID, size_t size) {
+    EncodeEntry({static_cast<uint32_t>(offset), attributes, uniqueID}, entry);
+    entry += format::kEntrySize;
+    offset += size;
+  };
+  uint8_t schemaAttr = static_cast<uint8_t>(schemaAttributes_ & ~format::kDirtyBit);
+  if (changed_) schemaAttr |= format::kDirtyBit;
+  putEntry(schemaAttr, schemaUniqueID_, schemaBytes.size());
+  for (int i = 0; i < format::kPopupRecords; ++i) {
+    putEntry(popups_[i].attributes, popups_[i].uniqueID, popupBytes[i].size());
+  }
+  for (const DataRecord& r : records_) putEntry(r.attributes(), r.uniqueID(), r.size());
+  if (offset > UINT32_MAX) return Status::Error("ERROR: The database is too large to save");
+
+  SafeFileWriter out(target);
+  if (Status s = out.Open(); !s) return s;
+  out.Write(head.data(), head.size());
+  out.Write(schemaBytes.data(), schemaBytes.size());
+  for (const Bytes& p : popupBytes) out.Write(p.data(), p.size());
+  for (const DataRecord& r : records_) out.Write(r.bytes().data(), r.size());
+  if (Status s = out.Commit(); !s) return s;
+
+  header_ = header;
+  path_ = target;
+  partial_ = false;
+  changed_ = false;
+  return Status::Ok();
+}
+
+bool Database::InsertRecord(size_t position, Bytes stored, uint8_t attributes, uint32_t uniqueID) {
+  if (!CanAddRecord()) return false;
+  position = std::min(position, records_.size());
+  records_.insert(records_.begin() + static_cast<std::ptrdiff_t>(position),
+                  DataRecord(std::move(stored), attributes, uniqueID));
+  changed_ = true;
+  return true;
+}
+
+bool Database::AppendRecord(Bytes stored, uint8_t attributes, uint32_t uniqueID) {
+  return InsertRecord(records_.size(), std::move(stored), attributes, uniqueID);
+}
+
+void Database::ReplaceRecord(size_t index, Bytes stored) {
+  records_[index].SetBytes(std::move(stored));
+  changed_ = true;
+}
+
+void Database::DeleteRecord(size_t index) {
+  records_.erase(records_.begin() + static_cast<std::ptrdiff_t>(index));
+  changed_ = true;
+}
+
+void Database::MoveRecord(size_t from, size_t to) {
+  if (from == to || from >= records_.size() || to >= records_.size()) return;
+  if (from < to) {
+    std::rotate(records_.begin() + from, records_.begin() + from + 1, records_.begin() + to + 1);
+  } else {
+    std::rotate(records_.begin() + to, records_.begin() + from, records_.begin() + from + 1);
+  }
+  changed_ = true;
+}
+
+uint32_t Database::NextUniqueNumber() {
+  if (nextUnique_ != 0) return nextUnique_;
+  uint32_t largest = 0;
+  for (int slot = 0; slot < format::kFieldCount; ++slot) {
+    FieldType t = schema_.field[slot].type();
+    if (t != FieldType::Unique && t != FieldType::Link) continue;
+    for (const DataRecord& r : records_) {
+      if (auto v = FieldValue(r.bytes(), slot)) largest = std::max(largest, ValueNumber(*v));
+    }
+  }
+  nextUnique_ = largest + 1;
+  return nextUnique_;
+}
+
+}  // namespace cx

@@ -1,0 +1,136 @@
+// The open database as one object: its path, header copy, schema, popup
+// lists and data records, held in memory between opening and saving.
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "engine/container.h"
+#include "engine/popups.h"
+#include "engine/record.h"
+#include "engine/record_reader.h"
+#include "engine/schema.h"
+#include "platform/clock.h"
+#include "platform/status.h"
+#include "platform/ui_port.h"
+
+namespace cx {
+
+// One data record: its stored bytes (a view into the file image it was
+// read from, or a block of its own once replaced), attributes and unique id.
+class DataRecord {
+ public:
+  DataRecord() = default;
+  DataRecord(ByteView bytes, uint8_t attributes, uint32_t uniqueID)
+      : data_(bytes.data()), size_(static_cast<uint32_t>(bytes.size())),
+        attributes_(attributes), uniqueID_(uniqueID) {}
+  DataRecord(Bytes bytes, uint8_t attributes, uint32_t uniqueID);
+
+  ByteView bytes() const { return ByteView(data_, size_); }
+  uint32_t size() const { return size_; }
+  uint8_t attributes() const { return attributes_; }
+  uint32_t uniqueID() const { return uniqueID_; }
+  void SetBytes(Bytes bytes);
+
+ private:
+  const uint8_t* data_ = nullptr;
+  uint32_t size_ = 0;
+  uint8_t attributes_ = 0;
+  uint32_t uniqueID_ = 0;
+  std::shared_ptr<const Bytes> owned_;
+};
+
+class Database {
+ public:
+  Database();
+
+  // A new, empty database (not yet on disk) at `path`, named `name`.
+  static Database CreateNew(const std::string& path, const std::string& name);
+
+  // Opens a database file. On failure the message has been shown through
+  // `ui` (and is in the status) and this object is unchanged. A data record
+  // that cannot be read is reported and ends the reading, yet the open
+  // succeeds with the records before it; partial() then tells, and Save()
+  // will not overwrite the original file.
+  Status Open(const std::string& path, UiPort& ui);
+
+  // Writes the database to its path (or to `path`), never damaging the file
+  // being replaced. On success the changed mark is cleared; on failure it
+  // stays, and the message is in the status.
+  Status Save(const Clock& clock = DefaultClock());
+  Status SaveAs(const std::string& path, const Clock& clock = DefaultClock());
+
+  const std::string& path() const { return path_; }
+  void SetPath(const std::string& path) { path_ = path; }
+  const Header& header() const { return header_; }
+  Header& header() { return header_; }
+  const Schema& schema() const { return schema_; }
+  Schema& schema() { return schema_; }
+  const PopupLists& popups() const { return popups_; }
+  PopupLists& popups() { return popups_; }
+  uint8_t schemaAttributes() const { return schemaAttributes_; }
+  uint32_t schemaUniqueID() const { return schemaUniqueID_; }
+
+  size_t recordCount() const { return records_.size(); }
+  ByteView record(size_t index) const { return records_[index].bytes(); }
+  const DataRecord& entry(size_t index) const { return records_[index]; }
+  // The record table, for operations that reorder it (sorting).
+  std::vector<DataRecord>& table() { return records_; }
+  const std::vector<DataRecord>& table() const { return records_; }
+
+  // Adding is refused (false) when the database already holds 65504
+  // records. New records get attributes 0 and unique id 0 unless given.
+  bool CanAddRecord() const { return records_.size() < format::kMaxDataRecords; }
+  bool InsertRecord(size_t position, Bytes stored, uint8_t attributes = 0, uint32_t uniqueID = 0);
+  bool AppendRecord(Bytes stored, uint8_t attributes = 0, uint32_t uniqueID = 0);
+  void ReplaceRecord(size_t index, Bytes stored);
+  void DeleteRecord(size_t index);
+  void MoveRecord(size_t from, size_t to);
+
+  // The next number for a Unique or Link field: one more than the largest
+  // such value in the database (1 when there is none), then counting up.
+  uint32_t NextUniqueNumber();
+  uint32_t TakeUniqueNumber() { return nextUnique_ = NextUniqueNumber(), nextUnique_++; }
+  void SetNextUniqueNumber(uint32_t next) { nextUnique_ = next; }
+
+  bool changed() const { return changed_; }
+  void MarkChanged() { changed_ = true; }
+  void ClearChanged() { changed_ = false; }
+  bool partial() const { return partial_; }
+  // Records whose slot lengths run past their end (reported at open).
+  size_t malformedRecords() const { return malformed_; }
+
+  std::string Name() const { return header_.Name(); }
+
+ private:
+  std::string path_;
+  Header header_;
+  Schema schema_;
+  PopupLists popups_{};
+  uint8_t schemaAttributes_ = 0;
+  uint32_t schemaUniqueID_ = 0;
+  std::vector<DataRecord> records_;
+  FileImage image_;  // keeps the views of unchanged records alive
+  uint32_t nextUnique_ = 0;  // 0: not yet computed
+  bool changed_ = false;
+  bool partial_ = false;
+  size_t malformed_ = 0;
+};
+
+// Messages of opening, as shown to the user.
+namespace messages {
+inline constexpr const char* kCannotOpen = "ERROR: Cannot Open File: %s for reading";
+inline constexpr const char* kBadHeader =
+    "ERROR: Reading header!\nMake sure you are converting a Cardovex data file!\n";
+inline constexpr const char* kCannotInit = "Could not initialize file";
+inline constexpr const char* kCannotReadSchema = "Could not read file";
+inline constexpr const char* kCannotReadRecord = "ERROR:Reading Record: %d";
+}  // namespace messages
+
+// printf-style "%s"/"%d" substitution for the messages above.
+std::string FormatMessage(const char* pattern, const std::string& text);
+std::string FormatMessage(const char* pattern, long number);
+
+}  // namespace cx

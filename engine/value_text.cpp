@@ -1,0 +1,206 @@
+#include "engine/value_text.h"
+
+#include <cctype>
+#include <cstdio>
+#include <cstdlib>
+#include <vector>
+
+#include "engine/dates.h"
+
+namespace cx {
+namespace {
+
+std::vector<std::string> Tokens(const std::string& pattern, char separator, size_t count) {
+  std::vector<std::string> tokens;
+  size_t start = 0;
+  while (tokens.size() < count && start <= pattern.size()) {
+    size_t end = pattern.find(separator, start);
+    if (end == std::string::npos) {
+      if (start < pattern.size()) tokens.push_back(pattern.substr(start));
+      break;
+    }
+    tokens.push_back(pattern.substr(start, end - start));
+    start = end + 1;
+  }
+  return tokens;
+}
+
+std::string Lower(std::string s) {
+  for (char& c : s) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+  return s;
+}
+
+std::string Format(const char* fmt, long value) {
+  char buf[32];
+  std::snprintf(buf, sizeof buf, fmt, value);
+  return buf;
+}
+
+}  // namespace
+
+std::string DateText(uint32_t dayNumber, const LocaleInfo& locale) {
+  CalendarDate d = DayNumberToDate(dayNumber);
+  if (d.month <= 1 && d.day <= 1 && d.year <= 1904) return "NO DATE";
+  std::vector<std::string> tokens = Tokens(locale.shortDate, locale.dateSeparator, 3);
+  std::string out;
+  for (size_t i = 0; i < tokens.size(); ++i) {
+    if (i > 0) out.push_back(locale.dateSeparator);
+    std::string t = Lower(tokens[i]);
+    if (t == "m") {
+      out += Format("%ld", d.month);
+    } else if (t == "mm" || t == "mmm") {  // a number even for "mmm"
+      out += Format("%02ld", d.month);
+    } else if (t == "d") {
+      out += Format("%ld", d.day);
+    } else if (t == "dd") {
+      out += Format("%02ld", d.day);
+    } else if (t == "yy") {
+      out += Format("%02ld", d.year % 100);
+    } else if (t == "yyyy") {
+      out += Format("%04ld", d.year);
+    }
+  }
+  return out;
+}
+
+std::string TimeText(uint8_t seconds, uint8_t minutes, uint8_t hours, const LocaleInfo& locale) {
+  if (hours == format::kNoTimeHours) return "No Time";
+  const bool twelve = locale.timeFormat.find("tt") != std::string::npos;
+  const long h12 = hours == 0 ? 12 : (hours > 12 ? hours - 12 : hours);
+  std::vector<std::string> tokens = Tokens(locale.timeFormat, locale.timeSeparator, 3);
+  std::string out;
+  for (size_t i = 0; i < tokens.size(); ++i) {
+    if (i > 0) out.push_back(locale.timeSeparator);
+    const std::string& t = tokens[i];
+    if (t == "h") {
+      out += Format("%ld", twelve ? h12 : (hours == 0 ? 12 : long(hours)));
+    } else if (t == "hh") {
+      out += Format("%02ld", twelve ? h12 : long(hours));
+    } else if (t == "H") {
+      out += Format("%ld", hours);
+    } else if (t == "HH") {
+      out += Format("%02ld", hours);
+    } else if (t == "mm") {
+      out += Format("%02ld", minutes);
+    } else if (t.find("ss") != std::string::npos) {
+      out += Format("%02ld", seconds);
+    }
+  }
+  if (twelve) {
+    out.push_back(' ');
+    out += hours < 12 ? locale.am : locale.pm;
+  }
+  return out;
+}
+
+std::string SecondsText(long seconds) {
+  char buf[48];
+  std::snprintf(buf, sizeof buf, "%ld:%02ld:%02ld", seconds / 3600, (seconds % 3600) / 60,
+                seconds % 60);
+  return buf;
+}
+
+std::string DecimalText(double value, int places, const LocaleInfo& locale) {
+  char spec[16];
+  std::snprintf(spec, sizeof spec, "12.%d", places);
+  char fmt[24];
+  std::snprintf(fmt, sizeof fmt, "%%%sf", spec);
+  char buf[512];
+  std::snprintf(buf, sizeof buf, fmt, value);
+  std::string out = buf;
+  size_t first = out.find_first_not_of(' ');
+  out.erase(0, first == std::string::npos ? out.size() : first);
+  if (locale.decimalSeparator != '.') {
+    size_t dot = out.find('.');
+    if (dot != std::string::npos) out[dot] = ',';
+  }
+  return out;
+}
+
+int DecimalPlaces(const FieldDef& field) {
+  if (field.type() == FieldType::Calculated) {
+    switch (field.resultFormat()) {
+      case 0: return 4;
+      case 4: return 3;
+      case 5: return 2;
+      case 6: return 1;
+      default: return 0;
+    }
+  }
+  return field.Places();
+}
+
+std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot) {
+  if (fieldSlot < 0 || fieldSlot >= format::kFieldCount) return "";
+  const FieldDef& field = ctx.schema.field[fieldSlot];
+  std::optional<ByteView> value = FieldValue(record, fieldSlot);
+  if (!value) return field.type() == FieldType::Calculated ? "Error!" : "";
+  switch (field.type()) {
+    case FieldType::NotUsed:
+    case FieldType::Image:
+    case FieldType::Heading:
+      return "";
+    case FieldType::Text:
+    case FieldType::Float:
+    case FieldType::Note:
+    case FieldType::DBPopup:
+      return ValueString(*value);
+    case FieldType::Integer:
+    case FieldType::Unique:
+    case FieldType::Link:
+    case FieldType::Linked:
+      return std::to_string(static_cast<int32_t>(ValueNumber(*value)));
+    case FieldType::PopUp:
+      return PopupText(ctx.popups[fieldSlot], value->empty() ? 0 : (*value)[0]);
+    case FieldType::CheckBox:
+      return !value->empty() && (*value)[0] != 0 ? "1" : "0";
+    case FieldType::Date:
+      return DateText(ValueNumber(*value), ctx.locale);
+    case FieldType::Time: {
+      uint8_t b[4] = {0, 0, 0, 0};
+      for (size_t i = 0; i < value->size() && i < 4; ++i) b[i] = (*value)[i];
+      return TimeText(b[0], b[1], b[2], ctx.locale);
+    }
+    case FieldType::Calculated: {
+      std::string stored = ValueString(*value);
+      switch (field.resultFormat()) {
+        case 0: case 1: case 4: case 5: case 6:
+          return stored;
+        case 2:
+          return SecondsText(std::strtol(stored.c_str(), nullptr, 10));
+        case 3:
+          return DateText(static_cast<uint32_t>(std::strtol(stored.c_str(), nullptr, 10)),
+                          ctx.locale);
+        default:
+          return "Error!";
+      }
+    }
+  }
+  return "";
+}
+
+std::string OneLine(const std::string& text) {
+  std::string out = text;
+  for (char& c : out) {
+    if (c == '\r' || c == '\n') c = ' ';
+  }
+  return out;
+}
+
+std::string CrLfLines(const std::string& text) {
+  std::string out;
+  out.reserve(text.size() + 8);
+  for (size_t i = 0; i < text.size(); ++i) {
+    char c = text[i];
+    if (c == '\r' || c == '\n') {
+      char other = c == '\r' ? '\n' : '\r';
+      if (i + 1 < text.size() && text[i + 1] == other) ++i;
+      out += "\r\n";
+    } else {
+      out.push_back(c);
+    }
+  }
+  return out;
+}
+
+}  // namespace cx

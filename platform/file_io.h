@@ -1,0 +1,57 @@
+// File access for the engine: whole-file reads and crash-safe replacement.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "platform/status.h"
+
+namespace cx {
+
+bool FileExists(const std::string& path);
+// Size in bytes, or -1 when the file cannot be examined.
+int64_t FileSize(const std::string& path);
+// Reads the whole file; false when it cannot be opened or read.
+bool ReadWholeFile(const std::string& path, std::vector<uint8_t>& out);
+// Reads up to `length` bytes starting at `offset`; returns the bytes read
+// (fewer at end of file) or -1 when the file cannot be opened or read.
+int64_t ReadFileRange(const std::string& path, uint64_t offset, size_t length, uint8_t* out);
+bool RemoveFile(const std::string& path);
+// Names of the regular files in `dir` (not recursive), unsorted.
+std::vector<std::string> ListFiles(const std::string& dir);
+bool MakeDirectories(const std::string& dir);
+
+// Writes a new version of a file without ever damaging the old one: the
+// bytes go to a temporary file in the same folder, which is flushed to disk
+// and then renamed over the target. Until Commit() succeeds the target is
+// untouched; destroying an uncommitted writer removes the temporary file.
+class SafeFileWriter {
+ public:
+  explicit SafeFileWriter(std::string target);
+  ~SafeFileWriter();
+  SafeFileWriter(const SafeFileWriter&) = delete;
+  SafeFileWriter& operator=(const SafeFileWriter&) = delete;
+
+  Status Open();
+  // Buffered; a failure is remembered and reported by Commit().
+  bool Write(const void* data, size_t size);
+  Status Commit();
+  void Abandon();
+  bool failed() const { return failed_; }
+
+ private:
+  bool Flush();
+
+  std::string target_;
+  std::string temp_;
+  int fd_ = -1;
+  bool failed_ = false;
+  std::string error_;
+  std::vector<uint8_t> buffer_;
+};
+
+// Writes a whole small file safely (as above).
+Status WriteFileSafely(const std::string& path, const void* data, size_t size);
+
+}  // namespace cx

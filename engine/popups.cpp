@@ -44,16 +44,17 @@ PopupList DecodePopupList(std::span<const uint8_t> record, uint8_t attributes, u
   list.uniqueID = uniqueID;
   list.original.assign(record.begin(), record.end());
   list.originalItems = list.items;
+  list.fromFile = true;
   return list;
 }
 
 std::vector<uint8_t> PopupList::Encode() const {
-  if (!original.empty() && items == originalItems) return original;
+  if (fromFile && items == originalItems) return original;
   return WritePopupItems(items);
 }
 
 size_t PopupList::EncodedSize() const {
-  if (!original.empty() && items == originalItems) return original.size();
+  if (fromFile && items == originalItems) return original.size();
   return PopupRecordSize(items);
 }
 

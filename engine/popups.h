@@ -22,6 +22,7 @@ struct PopupList {
   // characters, other padding) survives a save unchanged.
   std::vector<uint8_t> original;
   std::vector<std::string> originalItems;
+  bool fromFile = false;
 
   // The record to write for this list.
   std::vector<uint8_t> Encode() const;

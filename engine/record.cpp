@@ -76,6 +76,7 @@ std::optional<ByteView> FieldValue(ByteView record, int fieldSlot) {
 }
 
 bool RecordIsWellFormed(ByteView record) {
+  if (record.empty()) return true;  // no slots at all: every value reads empty
   size_t off = DataStart(record);
   if (off > record.size()) return false;
   for (int i = 0; i < format::kFieldCount; ++i) {
@@ -343,18 +344,14 @@ bool FieldEquals(int fieldSlot, ByteView value, ByteView editing, const Schema& 
 }
 
 void SetEditingText(Bytes& editing, int fieldSlot, const std::string& text, const Schema& schema) {
-  (void)schema;
   std::span<uint8_t> slot = EditingSlot(editing, fieldSlot);
-  if (slot.empty()) return;
-  std::memset(slot.data(), 0, slot.size());
-  size_t room = slot.size() - 1;
-  if (schema.field[fieldSlot].type() == FieldType::Linked) {
-    if (slot.size() <= kLinkedBlock) return;
-    room = slot.size() - kLinkedBlock - 1;
-    std::memcpy(slot.data() + kLinkedBlock, text.data(), std::min(text.size(), room));
-    return;
-  }
-  std::memcpy(slot.data(), text.data(), std::min(text.size(), room));
+  // A Linked value's text follows its 24-byte block, which holds the linked
+  // record's number and must survive a change of the text.
+  const size_t start = schema.field[fieldSlot].type() == FieldType::Linked ? kLinkedBlock : 0;
+  if (slot.size() <= start) return;
+  std::span<uint8_t> room = slot.subspan(start);
+  std::memset(room.data(), 0, room.size());
+  std::memcpy(room.data(), text.data(), std::min(text.size(), room.size() - 1));
 }
 
 void SetEditingNumber(Bytes& editing, int fieldSlot, uint32_t value, const Schema& schema) {

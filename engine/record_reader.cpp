@@ -39,7 +39,10 @@ bool RecordReader::Next(std::span<const uint8_t>& bytes, uint8_t& attributes, ui
     if (size >= format::kMaxRecordSize) return false;
   } else {
     size = fileSize - e.offset;
-    if (size > format::kMaxRecordSize) size = format::kMaxRecordSize;
+    if (size > format::kMaxRecordSize) {
+      size = format::kMaxRecordSize;
+      lastCut_ = true;
+    }
   }
   bytes = std::span<const uint8_t>(image_->data() + e.offset, size);
   attributes = e.attributes;

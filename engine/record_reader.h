@@ -31,6 +31,8 @@ class RecordReader {
   bool Next(std::span<const uint8_t>& bytes, uint8_t& attributes, uint32_t& uniqueID);
 
   size_t index() const { return next_; }
+  // True when the last record was longer than 65535 bytes and was cut.
+  bool lastRecordCut() const { return lastCut_; }
   size_t count() const { return entries_.size(); }
   const FileImage& image() const { return image_; }
   const std::vector<RecordEntry>& entries() const { return entries_; }
@@ -39,6 +41,7 @@ class RecordReader {
   FileImage image_;
   std::vector<RecordEntry> entries_;
   size_t next_ = 0;
+  bool lastCut_ = false;
 };
 
 // Reads record `index` of a database file without loading the database.

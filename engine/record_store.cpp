@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <filesystem>
 
 #include "engine/byte_order.h"
 #include "platform/file_io.h"
@@ -19,6 +20,41 @@ void DataRecord::SetBytes(Bytes bytes) {
   size_ = static_cast<uint32_t>(block->size());
   owned_ = std::move(block);
 }
+
+namespace {
+
+// The largest number a record holds in a Unique or Link slot (0 if none).
+uint32_t LargestUniqueValue(const Schema& schema, ByteView record) {
+  uint32_t largest = 0;
+  for (int slot = 0; slot < format::kFieldCount; ++slot) {
+    FieldType t = schema.field[slot].type();
+    if (t != FieldType::Unique && t != FieldType::Link) continue;
+    if (auto v = FieldValue(record, slot)) largest = std::max(largest, ValueNumber(*v));
+  }
+  return largest;
+}
+
+// Once the next unique number has been worked out (`next` nonzero), a
+// record that arrives with a larger one (received, imported, converted)
+// must move it on, or a later record would get a number already in use.
+void KeepAbove(uint32_t& next, const Schema& schema, ByteView record) {
+  if (next == 0) return;
+  uint32_t largest = LargestUniqueValue(schema, record);
+  if (largest >= next && largest != UINT32_MAX) next = largest + 1;
+}
+
+// True when both names lead to the same file, however they are spelt.
+bool SameFile(const std::string& a, const std::string& b) {
+  if (a == b) return true;
+  std::error_code ec;
+  if (std::filesystem::equivalent(a, b, ec) && !ec) return true;
+  const auto ca = std::filesystem::weakly_canonical(a, ec);
+  if (ec) return false;
+  const auto cb = std::filesystem::weakly_canonical(b, ec);
+  return !ec && ca == cb;
+}
+
+}  // namespace
 
 std::string FormatMessage(const char* pattern, const std::string& text) {
   std::string out = pattern;
@@ -97,6 +133,13 @@ Status Database::Open(const std::string& path, UiPort& ui) {
     if (!RecordIsWellFormed(bytes)) ++db.malformed_;
     db.records_.emplace_back(bytes, attributes, uniqueID);
   }
+  if (reader.lastRecordCut()) {
+    // Saving would write the cut record back and lose the rest of it.
+    db.partial_ = true;
+    ui.ShowMessage("The last record of this file is longer than 65535 bytes and was read only "
+                   "in part; save the database under another name to keep the original file.",
+                   "Error", MessageIcon::Warning);
+  }
   if (db.malformed_) {
     ui.ShowMessage(std::to_string(db.malformed_) +
                        " record(s) hold values that run past the end of the record; those "
@@ -111,7 +154,7 @@ Status Database::Open(const std::string& path, UiPort& ui) {
 Status Database::Save(const Clock& clock) { return SaveAs(path_, clock); }
 
 Status Database::SaveAs(const std::string& target, const Clock& clock) {
-  if (partial_ && target == path_) {
+  if (partial_ && SameFile(target, path_)) {
     return Status::Error(
         "ERROR: This database could only be read in part.\nSave it under another name so that "
         "the original file is kept.");
@@ -167,6 +210,7 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
 
 bool Database::InsertRecord(size_t position, Bytes stored, uint8_t attributes, uint32_t uniqueID) {
   if (!CanAddRecord()) return false;
+  KeepAbove(nextUnique_, schema_, stored);
   position = std::min(position, records_.size());
   records_.insert(records_.begin() + static_cast<std::ptrdiff_t>(position),
                   DataRecord(std::move(stored), attributes, uniqueID));
@@ -179,6 +223,7 @@ bool Database::AppendRecord(Bytes stored, uint8_t attributes, uint32_t uniqueID)
 }
 
 void Database::ReplaceRecord(size_t index, Bytes stored) {
+  KeepAbove(nextUnique_, schema_, stored);
   records_[index].SetBytes(std::move(stored));
   changed_ = true;
 }
@@ -201,13 +246,7 @@ void Database::MoveRecord(size_t from, size_t to) {
 uint32_t Database::NextUniqueNumber() {
   if (nextUnique_ != 0) return nextUnique_;
   uint32_t largest = 0;
-  for (int slot = 0; slot < format::kFieldCount; ++slot) {
-    FieldType t = schema_.field[slot].type();
-    if (t != FieldType::Unique && t != FieldType::Link) continue;
-    for (const DataRecord& r : records_) {
-      if (auto v = FieldValue(r.bytes(), slot)) largest = std::max(largest, ValueNumber(*v));
-    }
-  }
+  for (const DataRecord& r : records_) largest = std::max(largest, LargestUniqueValue(schema_, r.bytes()));
   nextUnique_ = largest + 1;
   return nextUnique_;
 }

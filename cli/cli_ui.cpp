@@ -1,0 +1,52 @@
+#include "cli/cli_ui.h"
+
+#include <ostream>
+
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+
+namespace {
+std::string Clean(const std::string& text) {
+  std::string s = Cp1252ToUtf8(text);
+  while (!s.empty() && s.back() == '\n') s.pop_back();
+  return s;
+}
+}  // namespace
+
+void CliUi::ShowMessage(const std::string& text, const std::string& caption, MessageIcon) {
+  ++messages_;
+  err_ << (caption.empty() ? "" : Clean(caption) + ": ") << Clean(text) << "\n";
+}
+
+bool CliUi::AskYesNo(const std::string& text, const std::string& caption) {
+  if (answer_) {
+    err_ << Clean(caption) << ": " << Clean(text) << " -> " << (*answer_ ? "Yes" : "No") << "\n";
+    return *answer_;
+  }
+  unanswered_ = true;
+  err_ << Clean(caption) << ": " << Clean(text)
+       << "\n(answer with --yes or --no; nothing was changed)\n";
+  return false;
+}
+
+bool CliUi::AskPassword(const std::string& expected) {
+  if (!passwordGiven_) {
+    err_ << "This database asks for its password: give it with --password.\n";
+    return false;
+  }
+  if (password_ == expected) return true;
+  ShowMessage("Invalid Password", "ERROR", MessageIcon::Error);
+  return false;
+}
+
+std::optional<std::string> CliUi::AskOpenFile(const std::string&, const std::string&) {
+  return std::nullopt;
+}
+
+std::optional<std::string> CliUi::AskSaveFile(const std::string&, const std::string&,
+                                              const std::string&) {
+  return std::nullopt;
+}
+
+}  // namespace cx::cli

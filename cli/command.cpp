@@ -1,0 +1,44 @@
+#include "cli/command.h"
+
+#include <algorithm>
+#include <ostream>
+
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+
+Registry& Registry::Instance() {
+  static Registry registry;
+  return registry;
+}
+
+void Registry::Add(CommandFactory factory) { factories_.push_back(std::move(factory)); }
+
+std::unique_ptr<Command> Registry::Find(const std::string& name) const {
+  for (const auto& f : factories_) {
+    auto c = f();
+    if (c->name() == name) return c;
+  }
+  return nullptr;
+}
+
+std::vector<std::unique_ptr<Command>> Registry::All() const {
+  std::vector<std::unique_ptr<Command>> all;
+  for (const auto& f : factories_) all.push_back(f());
+  std::sort(all.begin(), all.end(), [](const auto& a, const auto& b) { return a->name() < b->name(); });
+  return all;
+}
+
+int UsageError(Context& ctx, const Command& command, const std::string& message) {
+  ctx.err << "cardovex-cli " << command.name() << ": " << message << "\n\n" << command.help();
+  return kExitUsage;
+}
+
+int Failure(Context& ctx, const std::string& message) {
+  std::string text = Cp1252ToUtf8(message);
+  while (!text.empty() && text.back() == '\n') text.pop_back();
+  ctx.err << text << "\n";
+  return kExitFailed;
+}
+
+}  // namespace cx::cli

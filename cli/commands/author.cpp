@@ -1,0 +1,61 @@
+// author FILE [--author TEXT] [--comments TEXT]: the Author Information.
+#include <ostream>
+
+#include "cli/args.h"
+#include "cli/command.h"
+#include "cli/commands/design_common.h"
+#include "cli/database_access.h"
+#include "cli/json.h"
+#include "design/properties.h"
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+namespace {
+
+class AuthorCommand : public Command {
+ public:
+  std::string name() const override { return "author"; }
+  std::string summary() const override { return "show or set the author and comments"; }
+  std::string help() const override {
+    return "Usage: cardovex-cli [--password PW] author FILE [--author TEXT] [--comments TEXT]\n"
+           "Without options, shows the author and comments (with --json as an object).\n"
+           "  --author TEXT    at most 39 characters\n"
+           "  --comments TEXT  at most 69 characters\n"
+           "Changes need the \"DB Properties\" access.\n";
+  }
+
+  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    Args args(argv, {"--author", "--comments"}, {});
+    if (!args.ok()) return UsageError(ctx, *this, args.error());
+    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+    Database db;
+    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    AuthorInfo info = LoadAuthorInfo(db.schema());
+    if (args.has("--author") || args.has("--comments")) {
+      if (auto a = args.value("--author")) info.author = Utf8ToCp1252(*a);
+      if (auto c = args.value("--comments")) info.comments = Utf8ToCp1252(*c);
+      if (info.author.size() > 39) return UsageError(ctx, *this, "--author takes at most 39 characters");
+      if (info.comments.size() > 69) return UsageError(ctx, *this, "--comments takes at most 69 characters");
+      if (!PassAccessCheck(ctx, db, secured::kDBProperties)) return kExitFailed;
+      ApplyAuthorInfo(db, info);
+      if (!SaveForCommand(ctx, db)) return kExitFailed;
+    }
+    if (ctx.json) {
+      JsonWriter j(ctx.out);
+      j.BeginObject();
+      j.Key("author").String(Cp1252ToUtf8(info.author));
+      j.Key("comments").String(Cp1252ToUtf8(info.comments));
+      j.EndObject();
+      j.Finish();
+    } else {
+      ctx.out << "Author: " << Cp1252ToUtf8(info.author) << "\nComments: "
+              << Cp1252ToUtf8(info.comments) << "\n";
+    }
+    return kExitOk;
+  }
+};
+
+CX_REGISTER_COMMAND(AuthorCommand);
+
+}  // namespace
+}  // namespace cx::cli

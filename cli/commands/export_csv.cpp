@@ -1,0 +1,58 @@
+// export-csv FILE OUT: the records as comma-separated text.
+#include "cli/args.h"
+#include "cli/command.h"
+#include "cli/commands/text_output.h"
+#include "cli/database_access.h"
+#include "ops/csv_export.h"
+
+namespace cx::cli {
+namespace {
+
+class ExportCsvCommand : public Command {
+ public:
+  std::string name() const override { return "export-csv"; }
+  std::string summary() const override { return "write the records as comma-separated text"; }
+  std::string help() const override {
+    return "Usage: cardovex-cli export-csv FILE OUT [--quote-all] [--header] [--filtered]\n"
+           "                                [--slot-order]\n"
+           "Writes one line per record, each value as the list shows it (\"No Value\"\n"
+           "where that is empty; Image columns stay empty), lines ending in LF, in\n"
+           "Windows-1252. OUT '-' writes to standard output in UTF-8.\n"
+           "  --quote-all   quote every value (and the header's names)\n"
+           "  --header      a first line of field names\n"
+           "  --filtered    only the records in view (those that pass the filters)\n"
+           "  --slot-order  columns in field slot order instead of display order\n"
+           "Columns are the used fields. When the first field of the order is\n"
+           "Not-Used, every data line starts with a separator that the header lacks.\n";
+  }
+
+  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    Args args(argv, {}, {"--quote-all", "--header", "--filtered", "--slot-order"});
+    if (!args.ok()) return UsageError(ctx, *this, args.error());
+    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE OUT");
+    Database db;
+    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    CsvExportOptions options;
+    options.quoteAll = args.has("--quote-all");
+    options.withHeader = args.has("--header");
+    options.filteredOnly = args.has("--filtered");
+    options.fieldNumberOrder = args.has("--slot-order");
+    CsvSettings settings;
+    settings.alwaysQuote = options.quoteAll;
+    const std::string& out = args.positional()[1];
+    int result;
+    if (out == "-") {
+      Utf8StreamSink sink(ctx.out);
+      result = ExportCsvTo(db, options, sink, settings, ctx.locale, ctx.ui);
+    } else {
+      result = ExportCsv(db, options, out, settings, ctx.locale, ctx.ui);
+    }
+    if (result != 1) return Failure(ctx, "Could not export every record to " + out);
+    return kExitOk;
+  }
+};
+
+CX_REGISTER_COMMAND(ExportCsvCommand);
+
+}  // namespace
+}  // namespace cx::cli

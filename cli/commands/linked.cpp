@@ -1,0 +1,114 @@
+// linked FILE RECORD FIELD: the records a Link field of a record leads to.
+#include <ostream>
+
+#include "cli/args.h"
+#include "cli/command.h"
+#include "cli/commands/design_common.h"
+#include "cli/database_access.h"
+#include "cli/json.h"
+#include "design/link_access.h"
+#include "engine/value_text.h"
+#include "ops/links.h"
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+namespace {
+
+class LinkedCommand : public Command {
+ public:
+  std::string name() const override { return "linked"; }
+  std::string summary() const override { return "list the records a Link field leads to"; }
+  std::string help() const override {
+    return "Usage: cardovex-cli [--json] [--password PW] linked FILE RECORD FIELD [--all]\n"
+           "Opens the database that Link field FIELD (a slot number 0-29 or a name) of\n"
+           "record RECORD (its index in table order) names, in FILE's folder, and lists\n"
+           "the records linked to that record exactly as `records` lists records: those\n"
+           "whose \"Other Field #\" holds the record's link value and that pass the\n"
+           "linked database's filters.\n"
+           "  --all    the linked records whatever the filters say\n"
+           "The linked database must pass its \"Open Database\" access check.\n";
+  }
+
+  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    Args args(argv, {}, {"--all"});
+    if (!args.ok()) return UsageError(ctx, *this, args.error());
+    if (args.positional().size() != 3) return UsageError(ctx, *this, "expected FILE RECORD FIELD");
+    Database db;
+    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    auto record = ParseNumber(args.positional()[1]);
+    if (!record || *record < 0 || static_cast<size_t>(*record) >= db.recordCount()) {
+      return UsageError(ctx, *this, "RECORD must be a record index below " +
+                                        std::to_string(db.recordCount()));
+    }
+    const int slot = ResolveField(db, args.positional()[2]);
+    if (slot < 0 || db.schema().field[slot].type() != FieldType::Link) {
+      return UsageError(ctx, *this, args.positional()[2] + " is not a Link field");
+    }
+    LinkServices services = SecuredLinkServices(ctx.ui, &ctx.locale);
+    LinkedDatabase linked =
+        OpenLinkedDatabase(slot, db, static_cast<size_t>(*record), LinkAccess::Open, services);
+    if (!linked) return kExitFailed;
+    const Database& other = linked.db();
+    std::vector<size_t> rows;
+    if (args.has("--all")) {
+      rows = LinkedRecordIndexes(other, linked.restriction());
+    } else {
+      for (uint32_t i : RebuildView(other, &linked.restriction())) rows.push_back(i);
+    }
+    Write(ctx, other, rows);
+    return kExitOk;
+  }
+
+ private:
+  static void Write(Context& ctx, const Database& db, const std::vector<size_t>& rows) {
+    std::vector<int> slots;
+    for (uint8_t slot : db.schema().fieldOrder) {
+      if (db.schema().field[slot].type() != FieldType::NotUsed) slots.push_back(slot);
+    }
+    const ValueContext vc{db.schema(), db.popups(), ctx.locale};
+    if (ctx.json) {
+      JsonWriter j(ctx.out);
+      j.BeginArray();
+      for (size_t row : rows) {
+        j.BeginObject();
+        j.Key("index").Number(static_cast<int64_t>(row));
+        j.Key("fields").BeginArray();
+        for (int slot : slots) {
+          j.BeginObject();
+          j.Key("slot").Number(slot);
+          j.Key("name").String(Cp1252ToUtf8(db.schema().field[slot].name.str()));
+          j.Key("text").String(Cp1252ToUtf8(ValueText(vc, db.record(row), slot)));
+          j.EndObject();
+        }
+        j.EndArray();
+        j.EndObject();
+      }
+      j.EndArray();
+      j.Finish();
+      return;
+    }
+    std::string line;
+    for (size_t k = 0; k < slots.size(); ++k) {
+      if (k) line.push_back('\t');
+      line += Cp1252ToUtf8(db.schema().field[slots[k]].name.str());
+    }
+    ctx.out << line << "\n";
+    for (size_t row : rows) {
+      line.clear();
+      for (size_t k = 0; k < slots.size(); ++k) {
+        if (k) line.push_back('\t');
+        std::string text = OneLine(ValueText(vc, db.record(row), slots[k]));
+        for (char& c : text) {
+          if (c == '\t') c = ' ';
+        }
+        line += Cp1252ToUtf8(text);
+      }
+      ctx.out << line << "\n";
+    }
+  }
+};
+
+CX_REGISTER_COMMAND(LinkedCommand);
+
+}  // namespace
+}  // namespace cx::cli

@@ -1,0 +1,71 @@
+// new FILE: a new database with the fields given.
+#include <ostream>
+
+#include "cli/args.h"
+#include "cli/command.h"
+#include "cli/database_access.h"
+#include "cli/field_spec.h"
+#include "platform/file_io.h"
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+namespace {
+
+class NewCommand : public Command {
+ public:
+  std::string name() const override { return "new"; }
+  std::string summary() const override { return "create a new database with the fields given"; }
+  std::string help() const override {
+    return std::string(
+               "Usage: cardovex-cli new FILE --name NAME --field SPEC [--field SPEC ...]\n"
+               "                        [--extension] [--force]\n"
+               "Creates a database whose fields take slots 0, 1, ... in the order given.\n"
+               "  --name NAME    the database name (at most 19 characters)\n"
+               "  --field SPEC   NAME:TYPE[:option=value,...]; TYPE is a type label: Text,\n"
+               "                 Integer, Float, Pop-Up, Check-Box, Unique, Image, Date, Time,\n"
+               "                 Link, Linked, Note, Heading, DB Popup, Calculated\n"
+               "  --extension    records carry the 20-byte prefix extension\n"
+               "  --force        replace FILE if it exists\n") +
+           kFieldSpecHelp;
+  }
+
+  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    Args args(argv, {"--name", "--field"}, {"--extension", "--force"});
+    if (!args.ok()) return UsageError(ctx, *this, args.error());
+    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+    const std::string path = args.positional()[0];
+    std::string name = Utf8ToCp1252(args.value("--name").value_or(""));
+    if (name.empty()) return UsageError(ctx, *this, "--name is required");
+    if (name.size() > 19) return UsageError(ctx, *this, "a database name has at most 19 characters");
+    if (args.values("--field").size() > format::kFieldCount) {
+      return UsageError(ctx, *this, "a database has at most 30 fields");
+    }
+    if (FileExists(path) && !args.has("--force")) {
+      return Failure(ctx, "ERROR: " + path + " exists (use --force to replace it)");
+    }
+
+    Database db = Database::CreateNew(path, name);
+    Schema& schema = db.schema();
+    if (args.has("--extension")) schema.recordExtension = 1;
+    std::vector<FieldSpec> specs;
+    for (const std::string& text : args.values("--field")) {
+      FieldSpec spec;
+      std::string error;
+      if (!ParseFieldSpec(text, spec, error)) return UsageError(ctx, *this, error);
+      specs.push_back(std::move(spec));
+    }
+    for (size_t slot = 0; slot < specs.size(); ++slot) schema.field[slot] = specs[slot].def;
+    for (size_t slot = 0; slot < specs.size(); ++slot) {
+      std::string error;
+      if (!ResolveOperands(specs[slot], schema, error)) return UsageError(ctx, *this, error);
+      schema.field[slot] = specs[slot].def;
+      db.popups()[slot].items = specs[slot].popupItems;
+    }
+    return SaveForCommand(ctx, db) ? kExitOk : kExitFailed;
+  }
+};
+
+CX_REGISTER_COMMAND(NewCommand);
+
+}  // namespace
+}  // namespace cx::cli

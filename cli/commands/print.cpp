@@ -1,0 +1,70 @@
+// print FILE: the listing handed to the print command.
+#include "cli/args.h"
+#include "cli/command.h"
+#include "cli/database_access.h"
+#include "design/link_access.h"
+#include "ops/linked_listing.h"
+#include "ops/print.h"
+#include "platform/data_folder.h"
+#include "platform/file_io.h"
+
+namespace cx::cli {
+namespace {
+
+class PrintCommand : public Command {
+ public:
+  std::string name() const override { return "print"; }
+  std::string summary() const override { return "print records through the print command"; }
+  std::string help() const override {
+    return "Usage: cardovex-cli [--password PW] print FILE [--record N] [--command CMD]\n"
+           "                                [--arg ARG]...\n"
+           "Writes the listing of the records in view (or of record N) to\n"
+           "cxprnttemp.txt in the documents folder, runs the print command on it\n"
+           "(`lp FILE` unless --command names another program; each --arg goes before\n"
+           "the file) and removes the file again. Exit code 0 of the command reports\n"
+           "\"Data Printed OK\", 63 means cancelled (no message), others report a\n"
+           "problem. Nothing is run when the listing is empty.\n";
+  }
+
+  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    Args args(argv, {"--record", "--command", "--arg"}, {});
+    if (!args.ok()) return UsageError(ctx, *this, args.error());
+    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+    Database db;
+    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    bool all = true;
+    size_t current = 0;
+    if (auto r = args.value("--record")) {
+      auto n = ParseNumber(*r);
+      if (!n || *n < 0 || static_cast<size_t>(*n) >= db.recordCount()) {
+        return UsageError(ctx, *this, "--record takes a record index below " +
+                                          std::to_string(db.recordCount()));
+      }
+      all = false;
+      current = static_cast<size_t>(*n);
+    }
+    PrintSettings settings;
+    if (auto c = args.value("--command")) settings.command = *c;
+    settings.arguments = args.values("--arg");
+    settings.tempPath = DefaultPrintTempPath();
+    MakeDirectories(FolderPart(settings.tempPath));
+    LinkServices services = SecuredLinkServices(ctx.ui, &ctx.locale);
+    LinkedRecordsListing linked(services, ctx.locale);
+    SystemProcessRunner runner;
+    PrintOutcome outcome =
+        PrintRecords(db, all, current, ListingContext{ctx.locale, &linked}, settings, runner, ctx.ui);
+    switch (outcome) {
+      case PrintOutcome::Printed:
+      case PrintOutcome::Cancelled:
+      case PrintOutcome::NothingToPrint:
+        return kExitOk;
+      default:
+        return kExitFailed;
+    }
+  }
+};
+
+CX_REGISTER_COMMAND(PrintCommand);
+
+}  // namespace
+}  // namespace cx::cli

@@ -1,0 +1,26 @@
+// Output of the export, listing and report commands: the terminal gets
+// UTF-8, files keep the database's 8-bit Windows-1252 bytes.
+#pragma once
+
+#include <ostream>
+#include <string_view>
+
+#include "ops/text_sink.h"
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+
+class Utf8StreamSink : public TextSink {
+ public:
+  explicit Utf8StreamSink(std::ostream& out) : out_(out) {}
+  bool Write(std::string_view bytes) override {
+    std::string text = Cp1252ToUtf8(bytes);
+    out_.write(text.data(), static_cast<std::streamsize>(text.size()));
+    return out_.good();
+  }
+
+ private:
+  std::ostream& out_;
+};
+
+}  // namespace cx::cli

@@ -1,0 +1,33 @@
+#include "cli/database_access.h"
+
+#include <ostream>
+
+#include "cli/args.h"
+#include "platform/text_codec.h"
+
+namespace cx::cli {
+
+bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
+  Status s = db.Open(path, ctx.ui);
+  return s.ok();
+}
+
+bool SaveForCommand(Context& ctx, Database& db, const std::string& path) {
+  Status s = path.empty() ? db.Save() : db.SaveAs(path);
+  if (!s) {
+    Failure(ctx, s.message());
+    return false;
+  }
+  return true;
+}
+
+int ResolveField(const Database& db, const std::string& text) {
+  if (auto n = ParseNumber(text); n && *n >= 0 && *n < format::kFieldCount) return static_cast<int>(*n);
+  std::string wanted = Utf8ToCp1252(text);
+  for (int slot = 0; slot < format::kFieldCount; ++slot) {
+    if (db.schema().field[slot].name.str() == wanted) return slot;
+  }
+  return -1;
+}
+
+}  // namespace cx::cli

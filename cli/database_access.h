@@ -1,0 +1,22 @@
+// Opening and saving databases for commands: the access check, the open
+// with its messages, the pending work a file asks for, and the save.
+#pragma once
+
+#include <string>
+
+#include "cli/command.h"
+#include "engine/record_store.h"
+
+namespace cx::cli {
+
+// Opens `path` into `db`; on failure the message has gone to stderr and the
+// result is false.
+bool OpenForCommand(Context& ctx, const std::string& path, Database& db);
+
+// Saves `db` (to `path` when given); false after printing the message.
+bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");
+
+// A field given as a slot number (0-29) or a field name; -1 when neither.
+int ResolveField(const Database& db, const std::string& text);
+
+}  // namespace cx::cli

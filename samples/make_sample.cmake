@@ -1,0 +1,42 @@
+# Builds one sample database from its readable sources:
+#   cmake -DCLI=... -DSRC=<dir> -DOUT=<dir> -DNAME=<Name> -P make_sample.cmake
+# NAME.fields holds the field specifications, NAME.csv the records (UTF-8;
+# converted to the files' Windows-1252 here).
+cmake_minimum_required(VERSION 3.25)
+
+set(locale --date-format M/d/yyyy --time-format "h:mm:ss tt" --decimal .)
+set(db ${OUT}/${NAME}.PDB)
+
+function(run)
+  execute_process(COMMAND ${CLI} ${locale} ${ARGN} RESULT_VARIABLE rc OUTPUT_QUIET
+                  ERROR_VARIABLE err)
+  if(NOT rc EQUAL 0)
+    message(FATAL_ERROR "cardovex-cli ${ARGN} failed (${rc}): ${err}")
+  endif()
+endfunction()
+
+file(STRINGS ${SRC}/${NAME}.fields lines ENCODING UTF-8)
+set(fields)
+foreach(line IN LISTS lines)
+  if(line MATCHES "^#" OR line STREQUAL "")
+    continue()
+  endif()
+  list(APPEND fields --field "${line}")
+endforeach()
+run(new ${db} --force --name ${NAME} ${fields})
+
+execute_process(COMMAND iconv -f UTF-8 -t WINDOWS-1252 ${SRC}/${NAME}.csv
+                OUTPUT_FILE ${OUT}/${NAME}.cp1252.csv RESULT_VARIABLE rc)
+if(NOT rc EQUAL 0)
+  message(FATAL_ERROR "iconv failed on ${NAME}.csv")
+endif()
+run(import-csv ${db} ${OUT}/${NAME}.cp1252.csv)
+file(REMOVE ${OUT}/${NAME}.cp1252.csv)
+
+if(NAME STREQUAL "Vault")
+  # The vault asks for its password to be opened and to change its design.
+  run(security ${db} --set-password secret)
+  run(--password secret security ${db} "Open Database" "Password Required")
+  run(--password secret security ${db} "DB Properties" "Password Required")
+  run(--password secret security ${db} "Edit Records" "View Records Only")
+endif()

@@ -1,0 +1,174 @@
+#include <gtest/gtest.h>
+
+#include "engine/value_text.h"
+#include "tests/engine/test_databases.h"
+
+namespace cx {
+namespace {
+
+using testing::SlotWriter;
+
+LocaleInfo Dates(const std::string& pattern, char separator) {
+  LocaleInfo l;
+  l.shortDate = pattern;
+  l.dateSeparator = separator;
+  return l;
+}
+
+LocaleInfo Times(const std::string& pattern) {
+  LocaleInfo l;
+  l.timeFormat = pattern;
+  l.timeSeparator = ':';
+  return l;
+}
+
+TEST(DateTextTest, FollowsTheShortDatePattern) {
+  EXPECT_EQ(DateText(366, Dates("M/d/yyyy", '/')), "1/1/1905");
+  EXPECT_EQ(DateText(366, Dates("dd.MMM.yy", '.')), "01.01.05");
+  EXPECT_EQ(DateText(366 + 40, Dates("yyyy-MM-dd", '-')), "1905-02-10");
+  EXPECT_EQ(DateText(1, Dates("M/d/yyyy", '/')), "1/2/1904");
+  // An unknown token prints nothing; its separators stay.
+  EXPECT_EQ(DateText(366, Dates("d/q/yyyy", '/')), "1//1905");
+}
+
+TEST(DateTextTest, DayZeroIsNoDate) {
+  EXPECT_EQ(DateText(0, Dates("M/d/yyyy", '/')), "NO DATE");
+  EXPECT_EQ(DateText(0, Dates("dd.MM.yy", '.')), "NO DATE");
+}
+
+TEST(TimeTextTest, TwentyFourHourPatterns) {
+  EXPECT_EQ(TimeText(5, 7, 0, Times("H:mm:ss")), "0:07:05");
+  EXPECT_EQ(TimeText(5, 7, 13, Times("H:mm:ss")), "13:07:05");
+  EXPECT_EQ(TimeText(5, 7, 9, Times("HH:mm:ss")), "09:07:05");
+  EXPECT_EQ(TimeText(5, 7, 13, Times("hh:mm:ss")), "13:07:05");
+  // "h" without "tt" still shows midnight as 12.
+  EXPECT_EQ(TimeText(5, 7, 0, Times("h:mm:ss")), "12:07:05");
+}
+
+TEST(TimeTextTest, TwelveHourPatternsAppendTheDesignator) {
+  EXPECT_EQ(TimeText(5, 7, 0, Times("h:mm:ss tt")), "12:07:05 AM");
+  EXPECT_EQ(TimeText(5, 7, 12, Times("h:mm:ss tt")), "12:07:05 PM");
+  EXPECT_EQ(TimeText(5, 7, 13, Times("h:mm:ss tt")), "1:07:05 PM");
+  EXPECT_EQ(TimeText(5, 7, 13, Times("hh:mm:ss tt")), "01:07:05 PM");
+  LocaleInfo other = Times("h:mm:ss tt");
+  other.am = "vorm.";
+  EXPECT_EQ(TimeText(0, 30, 11, other), "11:30:00 vorm.");
+}
+
+TEST(TimeTextTest, HourByte255IsNoTime) {
+  EXPECT_EQ(TimeText(0, 0, 255, Times("h:mm:ss tt")), "No Time");
+  EXPECT_EQ(TimeText(0, 0, 255, Times("HH:mm:ss")), "No Time");
+}
+
+class ValueTextTest : public ::testing::Test {
+ protected:
+  ValueTextTest() {
+    popups[3].items = {"Low", "High", std::string(100, 'x')};
+  }
+  std::string Text(const testing::ByteVector& record, int slot) {
+    return ValueText(ValueContext{schema, popups, locale}, record, slot);
+  }
+
+  Schema schema = testing::EveryTypeSchema();
+  PopupLists popups{};
+  LocaleInfo locale = LocaleInfo::UnitedStates();
+};
+
+TEST_F(ValueTextTest, EveryType) {
+  testing::ByteVector linked = {9, 0, 0, 0};
+  linked.resize(24, 0xEE);
+  linked.insert(linked.end(), {'a', 'b', 0});
+  const auto record = SlotWriter()
+                          .Text("Hello")
+                          .Number(static_cast<uint32_t>(-42))
+                          .Text("3.14159")
+                          .Byte(1)
+                          .Byte(2)
+                          .Number(77)
+                          .Byte(0)
+                          .Number(366)
+                          .Raw({5, 7, 13, 0})
+                          .Number(12)
+                          .Raw(linked)
+                          .Text("note\r\nline")
+                          .Empty()
+                          .Text("Other")
+                          .Text("3725")
+                          .Text("366")
+                          .Text("2.50")
+                          .Text("1")
+                          .End()
+                          .bytes;
+  const char* expected[] = {"Hello", "-42", "3.14159", "High", "1", "77", "", "1/1/1905",
+                            "1:07:05 PM", "12", "9", "note\r\nline", "", "Other", "1:02:05",
+                            "1/1/1905", "2.50", "Error!", ""};
+  for (int slot = 0; slot < 19; ++slot) EXPECT_EQ(Text(record, slot), expected[slot]) << slot;
+}
+
+TEST_F(ValueTextTest, PopupAndCheckBoxValues) {
+  auto withPopup = [](uint8_t item, uint8_t check) {
+    return SlotWriter().Empty().Empty().Empty().Byte(item).Byte(check).End().bytes;
+  };
+  EXPECT_EQ(Text(withPopup(255, 0), 3), "No Value");
+  EXPECT_EQ(PopupText(popups[3], -1), "No Value");
+  EXPECT_EQ(Text(withPopup(255, 0), 4), "0");
+  EXPECT_EQ(Text(withPopup(0, 1), 3), "Low");
+  EXPECT_EQ(Text(withPopup(2, 1), 3), std::string(79, 'x'));
+  EXPECT_EQ(Text(withPopup(7, 1), 3), "");
+}
+
+TEST_F(ValueTextTest, MissingSlotIsEmptyButCalculatedIsError) {
+  const auto shortRecord = SlotWriter().Text("only").End().bytes;
+  EXPECT_EQ(Text(shortRecord, 0), "only");
+  EXPECT_EQ(Text(shortRecord, 1), "");
+  EXPECT_EQ(Text(shortRecord, 7), "");
+  EXPECT_EQ(Text(shortRecord, 14), "Error!");
+  // A record of nothing but its prefix.
+  const testing::ByteVector bare = {0};
+  EXPECT_EQ(Text(bare, 0), "");
+  EXPECT_EQ(Text(bare, 15), "Error!");
+  EXPECT_EQ(Text(bare, 30), "");
+}
+
+TEST(DecimalTextTest, PlacesAndDecimalSeparator) {
+  LocaleInfo dot;
+  LocaleInfo comma;
+  comma.decimalSeparator = ',';
+  LocaleInfo apostrophe;
+  apostrophe.decimalSeparator = '\'';
+  EXPECT_EQ(DecimalText(3.14159, 2, dot), "3.14");
+  EXPECT_EQ(DecimalText(3.14159, 2, comma), "3,14");
+  EXPECT_EQ(DecimalText(3.14159, 2, apostrophe), "3,14");
+  EXPECT_EQ(DecimalText(-2.5, 4, dot), "-2.5000");
+  EXPECT_EQ(DecimalText(7, 0, dot), "7");
+  EXPECT_EQ(DecimalText(123456789.125, 3, dot), "123456789.125");
+}
+
+TEST(DecimalTextTest, PlacesOfAField) {
+  FieldDef calc;
+  calc.typeNumber = static_cast<int16_t>(FieldType::Calculated);
+  const std::pair<uint8_t, int> formats[] = {{0, 4}, {1, 0}, {2, 0}, {3, 0},
+                                             {4, 3}, {5, 2}, {6, 1}, {9, 0}};
+  for (auto [format, places] : formats) {
+    calc.setResultFormat(format);
+    EXPECT_EQ(DecimalPlaces(calc), places) << int(format);
+  }
+  FieldDef number;
+  number.typeNumber = static_cast<int16_t>(FieldType::Float);
+  number.size = 2;
+  EXPECT_EQ(DecimalPlaces(number), 2);
+  number.size = 9;
+  EXPECT_EQ(DecimalPlaces(number), 4);
+  number.size = -1;
+  EXPECT_EQ(DecimalPlaces(number), 4);
+}
+
+TEST(LineTextTest, LineBreaks) {
+  EXPECT_EQ(CrLfLines("a\rb\nc\r\nd\n\re"), "a\r\nb\r\nc\r\nd\r\ne");
+  EXPECT_EQ(CrLfLines("\n\n"), "\r\n\r\n");
+  EXPECT_EQ(CrLfLines("\r\n\r\n"), "\r\n\r\n");
+  EXPECT_EQ(OneLine("a\r\nb\nc"), "a  b c");
+}
+
+}  // namespace
+}  // namespace cx

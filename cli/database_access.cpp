@@ -3,13 +3,16 @@
 #include <ostream>
 
 #include "cli/args.h"
+#include "design/security.h"
+#include "ops/open_database.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {
 
 bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
-  Status s = db.Open(path, ctx.ui);
-  return s.ok();
+  if (!CheckOpenAccess(path, ctx.ui)) return false;
+  DataSession session(db, ctx.locale, ctx.ui);
+  return OpenDatabase(session, path).ok();
 }
 
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path) {

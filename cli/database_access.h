@@ -9,8 +9,10 @@
 
 namespace cx::cli {
 
-// Opens `path` into `db`; on failure the message has gone to stderr and the
-// result is false.
+// Opens `path` into `db` as the program does: the "Open Database" access
+// check (asking for --password where the file requires it), the open with
+// its messages, and the recalculation or re-sort the file still owes. On
+// failure the message has gone to stderr and the result is false.
 bool OpenForCommand(Context& ctx, const std::string& path, Database& db);
 
 // Saves `db` (to `path` when given); false after printing the message.

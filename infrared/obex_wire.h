@@ -2,6 +2,7 @@
 // as many bytes as its length announces, all within one time limit.
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 #include <vector>
 
@@ -17,9 +18,10 @@ enum class ReadResult {
 };
 
 // Reads one packet within `timeoutMs`. Partial packets are left in
-// `packet` so that a caller can still look at the first byte.
+// `packet` so that a caller can still look at the first byte. A `stop` flag
+// that gets set ends the wait early (kFailed, ECANCELED).
 ReadResult ReadPacket(StreamConnection& connection, std::vector<uint8_t>& packet, int timeoutMs,
-                      int& error);
+                      int& error, const std::atomic<bool>* stop = nullptr);
 
 // Sends the whole packet; false (with `error`) if any of it did not go.
 bool SendPacket(StreamConnection& connection, const uint8_t* data, size_t size, int& error);

@@ -122,7 +122,7 @@ class TcpListener : public StreamListener {
 bool Resolve(const std::string& text, bool passive, addrinfo** out) {
   std::string host;
   int port = 0;
-  if (!ParseHostPort(text, kDefaultObexTcpPort, host, port)) return false;
+  if (!ParseHostPort(text, kDefaultObexTcpPort, host, port, passive)) return false;
   addrinfo hints{};
   hints.ai_family = AF_UNSPEC;
   hints.ai_socktype = SOCK_STREAM;
@@ -175,7 +175,8 @@ int ConnectPeer(const std::string& peer, int timeoutMs, int& error) {
 
 }  // namespace
 
-bool ParseHostPort(const std::string& text, int defaultPort, std::string& host, int& port) {
+bool ParseHostPort(const std::string& text, int defaultPort, std::string& host, int& port,
+                   bool allowPortZero) {
   std::string portText;
   if (!text.empty() && text.front() == '[') {
     size_t close = text.find(']');
@@ -199,7 +200,7 @@ bool ParseHostPort(const std::string& text, int defaultPort, std::string& host, 
   if (!portText.empty()) {
     char* end = nullptr;
     long value = std::strtol(portText.c_str(), &end, 10);
-    if (*end != '\0' || value < 1 || value > 65535) return false;
+    if (*end != '\0' || value < (allowPortZero ? 0 : 1) || value > 65535) return false;
     port = static_cast<int>(value);
   }
   return true;

@@ -14,8 +14,10 @@ namespace cx {
 constexpr int kDefaultObexTcpPort = 650;
 
 // Splits "HOST", "HOST:PORT", "[IPV6]:PORT" or a bare IPv6 address. False
-// when the text is empty or the port is not a number in 1..65535.
-bool ParseHostPort(const std::string& text, int defaultPort, std::string& host, int& port);
+// when the text is empty or the port is not a number in 1..65535 (0 too
+// with `allowPortZero`, which asks a listener for any free port).
+bool ParseHostPort(const std::string& text, int defaultPort, std::string& host, int& port,
+                   bool allowPortZero = false);
 
 // A peer list as kept in the settings: entries separated by commas,
 // semicolons or blanks; empty entries are dropped.

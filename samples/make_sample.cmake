@@ -32,6 +32,7 @@ if(NOT rc EQUAL 0)
 endif()
 run(import-csv ${db} ${OUT}/${NAME}.cp1252.csv)
 file(REMOVE ${OUT}/${NAME}.cp1252.csv)
+run(recalc ${db})
 
 if(NAME STREQUAL "Vault")
   # The vault asks for its password to be opened and to change its design.

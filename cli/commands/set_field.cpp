@@ -48,6 +48,7 @@ class SetFieldCommand : public Command {
            "  --default VALUE         Pop-Up default: an entry's text or \"No Value\"\n"
            "  --behavior B            Date/Time Behavior: its label or index\n"
            "  --other-db NAME         Link, Linked, DB Popup: the other database's name\n"
+           "  --other-db-from FILE    the same, read from that database file's header\n"
            "  --other-field N         Other Field # (counted from 1)\n"
            "  --group N               DB Popup: Group (0=none)\n"
            "  --show-value-from F     Link: a field of the other database, or none\n"
@@ -68,7 +69,7 @@ class SetFieldCommand : public Command {
     Args args(argv,
               {"--name", "--type", "--max-chars", "--places", "--pixels", "--visible", "--export",
                "--popups-append", "--default", "--behavior", "--other-db", "--other-field",
-               "--group", "--show-value-from", "--value1", "--value2", "--constant1",
+               "--other-db-from", "--group", "--show-value-from", "--value1", "--value2", "--constant1",
                "--constant2", "--prev1", "--prev2", "--operation", "--result-format"},
               {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
@@ -203,6 +204,13 @@ class SetFieldCommand : public Command {
       }
       any = true;
       s.behavior = *e;
+    }
+    if (auto from = args.value("--other-db-from")) {
+      any = true;
+      if (!PickOtherDatabase(*from, s)) {
+        error = "--other-db-from: " + *from + " is not a database";
+        return false;
+      }
     }
     if (!text("--other-db", s.otherDatabase, 19) || !number("--other-field", s.otherFieldNumber) ||
         !number("--group", s.group) || !field("--show-value-from", s.showValueFrom) ||

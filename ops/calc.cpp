@@ -1,0 +1,271 @@
+#include "ops/calc.h"
+
+#include <algorithm>
+#include <array>
+#include <vector>
+
+#include "engine/byte_order.h"
+#include "engine/value_text.h"
+#include "ops/field_values.h"
+#include "ops/sort.h"
+
+namespace cx {
+namespace {
+
+// A Calculated slot holds 15 bytes in the editing form, the last forced to
+// NUL: a result never keeps more characters than this.
+constexpr size_t kResultChars = 14;
+
+// What one pass needs besides the session: the view test prepared once and
+// the fields to evaluate, in display order.
+struct Pass {
+  DataSession& session;
+  ViewTester tester;
+  std::vector<int> fields;
+
+  Pass(DataSession& s, bool onlyPrevRecordFields) : session(s), tester(s.db, s.Link()) {
+    const Schema& schema = s.db.schema();
+    std::array<bool, format::kFieldCount> done{};
+    for (uint8_t f : schema.fieldOrder) {
+      if (f >= format::kFieldCount || done[f] || !IsCalculated(schema, f)) continue;
+      done[f] = true;
+      if (onlyPrevRecordFields && (schema.field[f].calcFlags & 3) == 0) continue;
+      fields.push_back(f);
+    }
+  }
+};
+
+// Replaces the value of slot `field` of a stored record with `text` and its
+// NUL. A record that ends before the slot is first brought to its full
+// stored form, as writing it from the editor would.
+void StoreSlotText(Bytes& record, int field, std::string_view text, const Schema& schema) {
+  int at = FieldOffset(field, record);
+  if (at < 0) {
+    record = Compact(Expand(record, schema), schema);
+    at = FieldOffset(field, record);
+    if (at < 0) return;
+  }
+  const size_t start = static_cast<size_t>(at) - 2;
+  const size_t oldEnd = std::min(record.size(), static_cast<size_t>(at) + GetLE16(record.data() + start));
+  Bytes value(2 + text.size() + 1, 0);
+  PutLE16(value.data(), static_cast<uint16_t>(text.size() + 1));
+  std::copy(text.begin(), text.end(), value.begin() + 2);
+  record.erase(record.begin() + static_cast<std::ptrdiff_t>(start),
+               record.begin() + static_cast<std::ptrdiff_t>(oldEnd));
+  record.insert(record.begin() + static_cast<std::ptrdiff_t>(start), value.begin(), value.end());
+}
+
+double Operand(const Pass& pass, const CalcOperand& op, const std::string& constant, ByteView record,
+               size_t index) {
+  if (!op.IsField()) return ParseDouble(constant);
+  const Database& db = pass.session.db;
+  if (op.fromPrevious) {
+    size_t p = index;
+    while (p > 0) {
+      --p;
+      if (pass.tester.InView(p)) return FieldOperandValue(db, db.record(p), op.field);
+    }
+    return 0.0;
+  }
+  return FieldOperandValue(db, record, op.field);
+}
+
+int Evaluate(const Pass& pass, int field, Bytes& record, size_t index) {
+  DataSession& s = pass.session;
+  const Schema& schema = s.db.schema();
+  if (!IsCalculated(schema, field)) return -1;
+  const FieldDef& def = schema.field[field];
+  const double a = Operand(pass, CalcOperand1(def), def.Constant1(), record, index);
+  const double b = Operand(pass, CalcOperand2(def), def.Constant2(), record, index);
+  const std::string text = CalcResultText(ApplyOperation(def.calcOperation, a, b), def.resultFormat(), s.locale);
+
+  std::optional<ByteView> old = FieldValue(record, field);
+  if (!old || ValueView(*old) != text) s.calc.fieldChanged[field] = 1;
+  const bool sameBytes = old && old->size() == text.size() + 1 &&
+                         std::equal(text.begin(), text.end(), old->begin()) && (*old)[text.size()] == 0;
+  if (!sameBytes) StoreSlotText(record, field, text, schema);
+  return 0;
+}
+
+int RecalculateWith(const Pass& pass, size_t index) {
+  Database& db = pass.session.db;
+  if (index >= db.recordCount()) return -1;
+  ByteView stored = db.record(index);
+  Bytes work(stored.begin(), stored.end());
+  for (int f : pass.fields) Evaluate(pass, f, work, index);
+  if (!std::equal(work.begin(), work.end(), stored.begin(), stored.end())) {
+    db.ReplaceRecord(index, std::move(work));
+  }
+  return 0;
+}
+
+// Every record from `start` on, or only those in view when the view is
+// restricted. Stops at the first failure.
+int Walk(const Pass& pass, size_t start) {
+  const bool restricted = pass.tester.Restricted();
+  for (size_t i = start; i < pass.session.db.recordCount(); ++i) {
+    if (restricted && !pass.tester.InView(i)) continue;
+    if (RecalculateWith(pass, i) != 0) return -1;
+  }
+  return 0;
+}
+
+bool SortKeyIsCalculated(const Schema& schema) {
+  return std::any_of(schema.sortKey.begin(), schema.sortKey.end(),
+                     [&](const SortKey& k) { return IsCalculated(schema, k.Field()); });
+}
+
+// Whether field `f` is a Calculated field that takes a changed field's value
+// from the previous record, directly or through the fields it uses.
+bool ReachesChangedThroughPrev(const Schema& schema, const RecalcState& calc, int f,
+                               std::array<bool, format::kFieldCount>& visited) {
+  if (f < 0 || f >= format::kFieldCount || visited[f]) return false;
+  visited[f] = true;
+  if (!IsCalculated(schema, f)) return false;
+  const FieldDef& def = schema.field[f];
+  const CalcOperand ops[2] = {CalcOperand1(def), CalcOperand2(def)};
+  for (const CalcOperand& op : ops) {
+    if (op.fromPrevious && op.field < format::kFieldCount && calc.fieldChanged[op.field]) return true;
+  }
+  for (const CalcOperand& op : ops) {
+    if (op.IsField() && op.field != f && !op.fromPrevious &&
+        ReachesChangedThroughPrev(schema, calc, op.field, visited)) {
+      return true;
+    }
+  }
+  return false;
+}
+
+}  // namespace
+
+int NeedsPrevRecord(const Database& db) {
+  const Schema& schema = db.schema();
+  for (int f = 0; f < format::kFieldCount; ++f) {
+    if (IsCalculated(schema, f) && (schema.field[f].calcFlags & 3) != 0) return 1;
+  }
+  return 0;
+}
+
+bool HasCalculatedField(const Schema& schema) {
+  for (int f = 0; f < format::kFieldCount; ++f) {
+    if (IsCalculated(schema, f)) return true;
+  }
+  return false;
+}
+
+double ApplyOperation(int operation, double a, double b) {
+  switch (static_cast<CalcOperation>(operation)) {
+    case CalcOperation::Add: return a + b;
+    case CalcOperation::Subtract: return a - b;
+    case CalcOperation::Multiply: return a * b;
+    case CalcOperation::Divide: return b == 0 ? 0.0 : a / b;
+    case CalcOperation::Min: return a > b ? b : a;
+    case CalcOperation::Max: return b > a ? b : a;
+    case CalcOperation::Average: return (a + b) * 0.5;
+  }
+  return 0.0;
+}
+
+double FieldOperandValue(const Database& db, ByteView record, int field) {
+  std::optional<ByteView> value = FieldValue(record, field);
+  if (!value) return 0.0;
+  switch (db.schema().field[field].type()) {
+    case FieldType::Text:
+    case FieldType::Float:
+    case FieldType::Note:
+    case FieldType::DBPopup:
+    case FieldType::Calculated:
+      return ParseDouble(ValueView(*value));  // an empty text reads as 0
+    case FieldType::Integer:
+    case FieldType::Unique:
+    case FieldType::Date:
+      return static_cast<int32_t>(ValueNumber(*value));
+    case FieldType::PopUp:
+      return value->empty() ? 0 : (*value)[0];
+    case FieldType::CheckBox:
+      return !value->empty() && (*value)[0] != 0 ? 1 : 0;
+    case FieldType::Time: {
+      const uint32_t t = Time24(*value);
+      return static_cast<double>(TimeSeconds(t & 0xFF, (t >> 8) & 0xFF, (t >> 16) & 0xFF));
+    }
+    case FieldType::Linked: {
+      std::optional<std::string_view> text = LinkedText(*value);
+      return text ? ParseDouble(*text) : 0.0;
+    }
+    default:
+      return 0.0;
+  }
+}
+
+std::string CalcResultText(double value, uint8_t resultFormat, const LocaleInfo& locale) {
+  FieldDef def;
+  def.typeNumber = static_cast<int16_t>(FieldType::Calculated);
+  def.setResultFormat(resultFormat);
+  std::string text = DecimalText(value, DecimalPlaces(def), locale);
+  if (text.size() > kResultChars) text.resize(kResultChars);
+  return text;
+}
+
+int EvaluateField(DataSession& session, int field, Bytes& record, size_t index) {
+  Pass pass(session, false);
+  return Evaluate(pass, field, record, index);
+}
+
+int RecalculateRecord(DataSession& session, size_t index) {
+  return RecalculateWith(Pass(session, false), index);
+}
+
+int RecalculatePrevRecordFields(DataSession& session) {
+  return Walk(Pass(session, true), 0);
+}
+
+int RecalculateFrom(DataSession& session, size_t start) {
+  Database& db = session.db;
+  RecalcState& calc = session.calc;
+  auto finish = [&](int result) {
+    calc.busy = false;
+    db.MarkChanged();
+    session.ui.SetBusy(false);
+    return result;
+  };
+  session.ui.SetBusy(true);
+  calc.busy = true;
+  session.ui.Status("Recalculating Fields");
+  if (!HasCalculatedField(db.schema())) return finish(0);
+
+  if (SortKeyIsCalculated(db.schema())) {
+    calc.resortPending = true;
+  } else if (calc.resortPending) {
+    session.ui.Status("Resorting...");
+    SortAll(db);
+    calc.resortPending = false;
+    start = 0;
+  }
+
+  session.ui.Status("Recalculating Fields...");
+  if (Walk(Pass(session, false), start) != 0) return finish(-1);
+
+  if (calc.resortPending) {
+    SortAll(db);
+    calc.resortPending = false;
+    if (NeedsPrevRecord(db)) {
+      session.ui.Status("Recalculating Previous Record Calculations...");
+      RecalculatePrevRecordFields(session);
+    }
+  }
+  return finish(0);
+}
+
+int RecalculateAfterMove(DataSession& session, size_t oldIndex, size_t newIndex) {
+  const size_t from = std::min(oldIndex, newIndex);
+  if (oldIndex != newIndex && NeedsPrevRecord(session.db)) return RecalculateFrom(session, from);
+  std::array<bool, format::kFieldCount> visited{};
+  for (int f = 0; f < format::kFieldCount; ++f) {
+    if (ReachesChangedThroughPrev(session.db.schema(), session.calc, f, visited)) {
+      return RecalculateFrom(session, from);
+    }
+  }
+  return 0;
+}
+
+}  // namespace cx

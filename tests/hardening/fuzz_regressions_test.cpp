@@ -1,0 +1,58 @@
+// Replays every fuzz corpus input and every input that once made a target
+// fail, so that each build (g++, the sanitizer build) checks them again.
+// A broken property aborts the run; the last "replaying" line names the
+// input.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <string>
+#include <vector>
+
+#include "fuzz/targets.h"
+
+namespace cx::fuzz {
+namespace {
+
+namespace fs = std::filesystem;
+
+std::vector<fs::path> InputsOf(const std::string& folder) {
+  std::vector<fs::path> files;
+  std::error_code ec;
+  for (const auto& e : fs::directory_iterator(folder, ec)) {
+    if (e.is_regular_file() && e.path().filename().string()[0] != '.') files.push_back(e.path());
+  }
+  std::sort(files.begin(), files.end());
+  return files;
+}
+
+size_t Replay(const Target& target, const std::string& folder) {
+  size_t count = 0;
+  for (const fs::path& file : InputsOf(folder)) {
+    std::ifstream in(file, std::ios::binary);
+    std::vector<uint8_t> bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    std::fprintf(stderr, "replaying %s\n", file.c_str());
+    EXPECT_EQ(target.run(bytes.data(), bytes.size()), 0) << file;
+    ++count;
+  }
+  return count;
+}
+
+class FuzzReplay : public ::testing::TestWithParam<Target> {};
+
+TEST_P(FuzzReplay, CorpusAndRegressionsPass) {
+  const Target& target = GetParam();
+  const std::string base = CARDOVEX_FUZZ_DIR;
+  size_t corpus = Replay(target, base + "/corpus/" + std::string(target.name));
+  Replay(target, base + "/regressions/" + std::string(target.name));
+  EXPECT_GT(corpus, 0u) << "no corpus for " << target.name;
+}
+
+INSTANTIATE_TEST_SUITE_P(Targets, FuzzReplay, ::testing::ValuesIn(kTargets),
+                         [](const auto& info) { return std::string(info.param.name); });
+
+}  // namespace
+}  // namespace cx::fuzz

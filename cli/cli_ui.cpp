@@ -1,5 +1,8 @@
 #include "cli/cli_ui.h"
 
+#include <unistd.h>
+
+#include <iostream>
 #include <ostream>
 
 #include "platform/text_codec.h"
@@ -23,6 +26,12 @@ bool CliUi::AskYesNo(const std::string& text, const std::string& caption) {
   if (answer_) {
     err_ << Clean(caption) << ": " << Clean(text) << " -> " << (*answer_ ? "Yes" : "No") << "\n";
     return *answer_;
+  }
+  if (::isatty(STDIN_FILENO) && ::isatty(STDERR_FILENO)) {
+    err_ << Clean(caption) << ": " << Clean(text) << " [y/N] " << std::flush;
+    std::string reply;
+    std::getline(std::cin, reply);
+    return !reply.empty() && (reply[0] == 'y' || reply[0] == 'Y');
   }
   unanswered_ = true;
   err_ << Clean(caption) << ": " << Clean(text)

@@ -27,8 +27,9 @@ constexpr const char* kGlobalHelp = R"(Global options (before or after the comma
                          use ",")
                          Defaults for all of these come from the system locale.
   --password TEXT        the password of a protected database
-  --yes, --no            the answer to every question the command asks (without
-                         one, a command that must ask refuses and changes nothing)
+  --yes, --no            the answer to every question the command asks; without
+                         one, questions are asked on the terminal, or (with no
+                         terminal) refused, and the command changes nothing
   --json                 machine-readable output
   --help [COMMAND]       this text, or a command's own
   --version              the program's version

@@ -1,5 +1,5 @@
 // The objects the beaming commands send: a whole database, one record
-// (".cxr") and the records in view (".cxm"). PAYLOADS.md describes them.
+// (".cxr") and the records in view (".cxm"). docs/file-format.md describes them.
 #pragma once
 
 #include <cstdint>

@@ -1,4 +1,4 @@
-// The ".cxm" payload: several data records in one object. PAYLOADS.md
+// The ".cxm" payload: several data records in one object. docs/file-format.md
 // describes the layout.
 #pragma once
 

@@ -1,6 +1,6 @@
 // The view settings each database carries in its schema record: the two
 // filters with their combination flags, the search settings, and the
-// per-field "Sort Popups" flag. ops/SETTINGS-FORMAT.md documents where each
+// per-field "Sort Popups" flag. docs/file-format.md documents where each
 // one lives; every byte that is not one of these settings is written back
 // exactly as it was read.
 #pragma once

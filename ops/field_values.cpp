@@ -5,6 +5,8 @@
 #include <cmath>
 #include <cstring>
 
+#include "engine/byte_order.h"
+
 namespace cx {
 namespace {
 
@@ -68,6 +70,20 @@ double ParseDouble(std::string_view text) {
     value = OutOfRange(std::string_view(begin, static_cast<size_t>(result.ptr - begin)), hex);
   }
   return negative ? -value : value;
+}
+
+SlotValues AllSlotValues(ByteView record) {
+  SlotValues values;
+  size_t off = DataStart(record);
+  for (int i = 0; i < format::kFieldCount; ++i) {
+    if (off + 2 > record.size()) break;
+    const size_t len = GetLE16(record.data() + off);
+    if (len == format::kEndMark) break;
+    const size_t at = off + 2;
+    values[i] = record.subspan(at, std::min(len, record.size() - at));
+    off = at + len;
+  }
+  return values;
 }
 
 std::string_view ValueView(ByteView value) {

@@ -3,6 +3,7 @@
 // FieldValue) and never allocate unless they return a string.
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -33,6 +34,11 @@ bool ContainsText(std::string_view haystack, std::string_view needle, bool begin
 // "inf", "nan" and hexadecimal); it stops at anything else and no number
 // gives 0. The process locale plays no part: "," never counts as a point.
 double ParseDouble(std::string_view text);
+
+// The value of every slot of a record, found in one walk: entry i is what
+// FieldValue(record, i) gives.
+using SlotValues = std::array<std::optional<ByteView>, format::kFieldCount>;
+SlotValues AllSlotValues(ByteView record);
 
 // The text of a value up to its NUL (or the end of the value).
 std::string_view ValueView(ByteView value);

@@ -16,11 +16,9 @@ bool AllDigits(const std::string& s) {
   return !s.empty() && std::all_of(s.begin(), s.end(), [](char c) { return c >= '0' && c <= '9'; });
 }
 
-}  // namespace
-
-int FieldMatches(const Database& db, ByteView record, int field, const std::string& needle,
+// The field test on a value already looked up.
+int ValueMatches(const Database& db, std::optional<ByteView> value, int field, const std::string& needle,
                  bool caseSensitive, bool beginsWith, const LocaleInfo& locale) {
-  std::optional<ByteView> value = FieldValue(record, field);
   if (!value) return 0;
   const FieldDef& def = db.schema().field[field];
   auto match = [&](std::string_view text) { return ContainsText(text, needle, beginsWith) ? 1 : 0; };
@@ -85,6 +83,13 @@ int FieldMatches(const Database& db, ByteView record, int field, const std::stri
   return 0;
 }
 
+}  // namespace
+
+int FieldMatches(const Database& db, ByteView record, int field, const std::string& needle,
+                 bool caseSensitive, bool beginsWith, const LocaleInfo& locale) {
+  return ValueMatches(db, FieldValue(record, field), field, needle, caseSensitive, beginsWith, locale);
+}
+
 int ListColumnOfField(const Schema& schema, int field) {
   int column = 0;
   for (uint8_t f : schema.fieldOrder) {
@@ -119,8 +124,11 @@ int FindRecord(const Database& db, const SearchSettings& search, int startIndex,
       }
     } else {
       const int first = i == start ? std::clamp(startField, 0, format::kFieldCount) : 0;
+      const SlotValues values = AllSlotValues(record);
       for (int f = first; f < format::kFieldCount && matched < 0; ++f) {
-        if (FieldMatches(db, record, f, needle, search.caseSensitive, search.beginsWith, locale)) matched = f;
+        if (ValueMatches(db, values[f], f, needle, search.caseSensitive, search.beginsWith, locale)) {
+          matched = f;
+        }
       }
     }
     if (matched >= 0) {

@@ -191,11 +191,22 @@ size_t DeleteLinkedRecords(size_t recordIndex, const Database& db, const LinkSer
 bool ForEachLinkedRecord(size_t recordIndex, const Database& db, int fieldSlot,
                          const LinkServices& services,
                          const std::function<void(const Database& linked, size_t index)>& visit) {
-  LinkedDatabase linked = OpenLinkedDatabase(fieldSlot, db, recordIndex, LinkAccess::Open, services);
-  if (!linked) return false;
-  for (size_t i : LinkedRecordIndexes(linked.db(), linked.restriction())) visit(linked.db(), i);
-  // Looking changes nothing worth writing: the database is let go unsaved.
-  return true;
+  Chain& chain = services.visiting;
+  const bool outermost = chain.empty();
+  if (outermost) chain.push_back(db.path());
+  std::string path = db.schema().field[fieldSlot].text.str();
+  bool visited = false;
+  if (!FindDatabaseBeside(path, db.path()) || !InChain(chain, path)) {
+    LinkedDatabase linked = OpenLinkedDatabase(fieldSlot, db, recordIndex, LinkAccess::Open, services);
+    if (linked) {
+      chain.push_back(linked.db().path());
+      for (size_t i : LinkedRecordIndexes(linked.db(), linked.restriction())) visit(linked.db(), i);
+      chain.pop_back();
+      visited = true;
+    }
+  }
+  if (outermost) chain.clear();
+  return visited;
 }
 
 TransferResult TransferRecords(bool move, const TransferWhich& which, DataSession& source,

@@ -42,6 +42,10 @@ struct LinkServices {
   // loaded here (re-sorting, recalculating); null: that work waits for the
   // database's next opening.
   const LocaleInfo* locale = nullptr;
+  // The databases a walk through links is inside of, outermost first, so
+  // that a link leading back to one of them is not followed again. Kept by
+  // ForEachLinkedRecord while it visits; starts and ends empty.
+  mutable std::vector<std::string> visiting;
 
   const Clock& SaveClock() const { return clock ? *clock : DefaultClock(); }
 };
@@ -117,8 +121,10 @@ size_t DeleteLinkedRecords(size_t recordIndex, const Database& db, const LinkSer
 
 // Calls `visit` for each record linked to record `recordIndex` of `db`
 // through Link field `fieldSlot` (filters off, table order). False when the
-// linked database could not be opened (the field is then skipped). Used by
-// listings.
+// linked database could not be opened (the field is then skipped), or when
+// it is one the walk is already inside of (a visit that lists records with
+// links of their own comes back here, and links leading back end). The
+// database is let go unsaved. Used by listings.
 bool ForEachLinkedRecord(size_t recordIndex, const Database& db, int fieldSlot,
                          const LinkServices& services,
                          const std::function<void(const Database& linked, size_t index)>& visit);

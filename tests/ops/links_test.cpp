@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "ops/delete_records.h"
+#include "ops/linked_listing.h"
 #include "tests/design/design_db.h"
 #include "tests/support/test_support.h"
 
@@ -143,6 +144,25 @@ TEST_F(LinkedFiles, LinksLeadingBackAreNotFollowedAgain) {
   Database orders = Load("Orders.PDB");
   EXPECT_EQ(DeleteLinkedRecords(0, orders, services), 5u);
   EXPECT_EQ(Load("Orders.PDB").recordCount(), 2u);
+}
+
+TEST_F(LinkedFiles, ListingFollowsLinksButNotBackAgain) {
+  Database parts = Load("Parts.PDB");
+  parts.schema().field[2].typeNumber = static_cast<int16_t>(T::Link);
+  parts.schema().field[2].name.set("Back");
+  LinkTo(parts, 2, "Orders", 1);
+  ASSERT_TRUE(parts.Save().ok());
+  Database orders = Load("Orders.PDB");
+  LocaleInfo locale;
+  LinkedRecordsListing linked(services, locale);
+  StringSink out;
+  WriteRecordListing(1, orders, out, 0, ListingContext{locale, &linked});
+  const std::string dashes(40, '-');
+  EXPECT_EQ(out.text, "Order: second\n"
+                      "   Item: nut\n   Order: 2\n"
+                      "      Part: p11\n      Item: 11\n" +
+                          dashes + "\n" + dashes + "\n" + dashes + "\n");
+  EXPECT_TRUE(services.visiting.empty());
 }
 
 TEST_F(LinkedFiles, ForEachLinkedRecordVisitsInTableOrder) {

@@ -1,0 +1,68 @@
+// receive: listens for beamed databases and records and stores them in the
+// data folder.
+#include <csignal>
+#include <ostream>
+
+#include "cli/args.h"
+#include "cli/command.h"
+#include "infrared/receiver.h"
+#include "platform/data_folder.h"
+#include "platform/qt/qt_platform.h"
+
+namespace cx::cli {
+namespace {
+
+// Set by Ctrl-C; a signal handler can reach nothing else.
+std::atomic<bool>& StopFlag() {
+  static std::atomic<bool> stop{false};
+  return stop;
+}
+
+extern "C" void OnInterrupt(int) { StopFlag() = true; }
+
+class ReceiveCommand : public Command {
+ public:
+  std::string name() const override { return "receive"; }
+  std::string summary() const override { return "receive beamed databases and records"; }
+  std::string help() const override {
+    return "Usage: cardovex-cli [--yes] receive [--listen HOST:PORT] [--count N]\n"
+           "Listens for OBEX transfers over TCP (default: the ReceiveAddress setting, else\n"
+           "0.0.0.0:650; ports below 1024 need root) and stores what arrives in the data\n"
+           "folder: a database is stored after asking (an existing one is replaced only\n"
+           "when that is answered Yes), records are inserted into the database of the\n"
+           "same name, which must be present. --yes answers every question Yes; without\n"
+           "it the questions are asked on the terminal, or answered No when there is none.\n"
+           "  --count N   stop after N objects have arrived (default: run until Ctrl-C)\n"
+           "Prints \"Listening on ADDR\" and one line per object.\n";
+  }
+
+  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    Args args(argv, {"--listen", "--count"}, {});
+    if (!args.ok()) return UsageError(ctx, *this, args.error());
+    if (!args.positional().empty()) return UsageError(ctx, *this, "unexpected argument");
+    obex::ReceiverOptions options;
+    auto settings = OpenDesktopSettings();
+    if (auto a = settings->Get(obex::kReceiveAddressSetting); a && !a->empty()) options.address = *a;
+    if (auto a = args.value("--listen")) options.address = *a;
+    if (auto c = args.value("--count")) {
+      auto n = ParseNumber(*c);
+      if (!n || *n <= 0) return UsageError(ctx, *this, "--count takes a positive number");
+      options.count = static_cast<int>(*n);
+    }
+    StopFlag() = false;
+    auto previous = std::signal(SIGINT, OnInterrupt);
+    std::string folder = DataFolder(DesktopDocumentsFolder());
+    Status s = obex::ReceiveIntoDataFolder(
+        folder, ctx.ui, options, StopFlag(),
+        [&](const std::string& address) { ctx.out << "Listening on " << address << std::endl; },
+        [&](const std::string& line) { ctx.out << line << std::endl; });
+    std::signal(SIGINT, previous);
+    if (!s) return Failure(ctx, s.message());
+    return kExitOk;
+  }
+};
+
+CX_REGISTER_COMMAND(ReceiveCommand);
+
+}  // namespace
+}  // namespace cx::cli

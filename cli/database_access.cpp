@@ -10,8 +10,12 @@
 namespace cx::cli {
 
 bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
-  if (!CheckOpenAccess(path, ctx.ui)) return false;
   DataSession session(db, ctx.locale, ctx.ui);
+  return OpenForCommand(ctx, path, session);
+}
+
+bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session) {
+  if (!CheckOpenAccess(path, ctx.ui)) return false;
   return OpenDatabase(session, path).ok();
 }
 

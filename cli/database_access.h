@@ -6,6 +6,7 @@
 
 #include "cli/command.h"
 #include "engine/record_store.h"
+#include "ops/session.h"
 
 namespace cx::cli {
 
@@ -14,6 +15,9 @@ namespace cx::cli {
 // its messages, and the recalculation or re-sort the file still owes. On
 // failure the message has gone to stderr and the result is false.
 bool OpenForCommand(Context& ctx, const std::string& path, Database& db);
+// The same into a session made with ctx's locale and port, for commands
+// that go on working in it (its view list and run-time state are kept).
+bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session);
 
 // Saves `db` (to `path` when given); false after printing the message.
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");

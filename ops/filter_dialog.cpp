@@ -1,13 +1,103 @@
 #include "ops/filter_dialog.h"
 
+#include <charconv>
+#include <cstdint>
+
+#include "engine/field_types.h"
 #include "ops/database_settings.h"
 #include "ops/field_values.h"
+#include "ops/value_parse.h"
 
 namespace cx {
 namespace {
 
 TimeOfDay TimeFrom24(uint32_t t) {
   return {static_cast<uint8_t>(t >> 16), static_cast<uint8_t>(t >> 8), static_cast<uint8_t>(t)};
+}
+
+// A text box's contents end in a zero inside the 40 stored bytes.
+constexpr size_t kFilterTextMax = 39;
+
+std::string Quote(std::string_view text) { return "\"" + std::string(text) + "\""; }
+
+bool SplitLimits(std::string_view text, std::string_view& low, std::string_view& high, std::string& error) {
+  const size_t at = text.find("..");
+  if (at == std::string_view::npos || at == 0 || at + 2 >= text.size()) {
+    error = "Limits are written LOW..HIGH, not " + Quote(text);
+    return false;
+  }
+  low = text.substr(0, at);
+  high = text.substr(at + 2);
+  return true;
+}
+
+bool WholeNumber(std::string_view text, std::string& error) {
+  int32_t value = 0;
+  const char* end = text.data() + text.size();
+  auto [ptr, ec] = std::from_chars(text.data(), end, value);
+  if (ec != std::errc() || ptr != end) {
+    error = Quote(text) + " is not a whole number from -2147483648 to 2147483647";
+    return false;
+  }
+  return true;
+}
+
+// Decimal limits are kept as typed and read back with the C library's
+// conversion, which knows only "." as the point; so the whole text must be
+// a number in that form, or the stored limit would mean something else.
+bool DecimalNumber(std::string_view text, std::string& error) {
+  double value = 0;
+  const char* end = text.data() + text.size();
+  auto [ptr, ec] = std::from_chars(text.data(), end, value);
+  if (ec != std::errc() || ptr != end) {
+    error = Quote(text) + " is not a decimal number (with \".\" as the point)";
+    return false;
+  }
+  if (text.size() > kFilterTextMax) {
+    error = Quote(text) + " is longer than " + std::to_string(kFilterTextMax) + " characters";
+    return false;
+  }
+  return true;
+}
+
+bool DayOf(std::string_view text, const LocaleInfo& locale, uint32_t& day, std::string& error) {
+  std::optional<CalendarDate> date = ParseDateText(text, locale);
+  day = date ? DateToDayNumber(*date) : 0;
+  if (day == 0) {
+    error = Quote(text) + " is not a date from 1904 on in the pattern " + locale.shortDate;
+    return false;
+  }
+  return true;
+}
+
+// A time picker offers the hours of one day.
+bool TimeOf(std::string_view text, const LocaleInfo& locale, TimeOfDay& time, std::string& error) {
+  std::optional<ClockTime> t = ParseTimeText(text, locale);
+  if (!t || t->hours < 0 || t->hours > 23 || t->minutes < 0 || t->minutes > 59 || t->seconds < 0 ||
+      t->seconds > 59) {
+    error = Quote(text) + " is not a time of day in the pattern " + locale.timeFormat;
+    return false;
+  }
+  time = {static_cast<uint8_t>(t->hours), static_cast<uint8_t>(t->minutes), static_cast<uint8_t>(t->seconds)};
+  return true;
+}
+
+bool PopupChoiceOf(const Database& db, int field, std::string_view text, int& choice, std::string& error) {
+  if (text == "No Value") {
+    choice = kNoValueChoice;
+    return true;
+  }
+  const std::vector<std::string>& items = db.popups()[field].items;
+  for (bool exact : {true, false}) {
+    for (size_t i = 0; i < items.size(); ++i) {
+      if (exact ? items[i] == text : CompareNoCase(items[i], text) == 0) {
+        choice = static_cast<int>(i);
+        return true;
+      }
+    }
+  }
+  error = "No entry " + Quote(text) + " in the popup list of " + Quote(db.schema().field[field].name.str());
+  return false;
 }
 
 }  // namespace
@@ -121,6 +211,64 @@ void AcceptFilterDialog(Database& db, const FilterDialogValues& values) {
   }
   StoreFilterSettings(settings, db.schema());
   db.MarkChanged();
+}
+
+bool ReadFilterValueText(const Database& db, int field, std::string_view text, const LocaleInfo& locale,
+                         FilterDialogFilter& filter, std::string& error) {
+  FilterDialogFilter f = filter;
+  f.field = field;
+  std::string_view low, high;
+  switch (FilterControlsFor(db.schema(), field)) {
+    case FilterControls::MustContain:
+      if (text.size() > kFilterTextMax) {
+        error = Quote(text) + " is longer than " + std::to_string(kFilterTextMax) + " characters";
+        return false;
+      }
+      f.mustContain = std::string(text);
+      break;
+    case FilterControls::WholeLimits:
+      if (!SplitLimits(text, low, high, error) || !WholeNumber(low, error) || !WholeNumber(high, error)) {
+        return false;
+      }
+      f.lowerLimit = std::string(low);
+      f.upperLimit = std::string(high);
+      break;
+    case FilterControls::DecimalLimits:
+      if (!SplitLimits(text, low, high, error) || !DecimalNumber(low, error) || !DecimalNumber(high, error)) {
+        return false;
+      }
+      f.lowerLimit = std::string(low);
+      f.upperLimit = std::string(high);
+      break;
+    case FilterControls::DateLimits:
+      if (!SplitLimits(text, low, high, error) || !DayOf(low, locale, f.lowerDay, error) ||
+          !DayOf(high, locale, f.upperDay, error)) {
+        return false;
+      }
+      break;
+    case FilterControls::TimeLimits:
+      if (!SplitLimits(text, low, high, error) || !TimeOf(low, locale, f.lowerTime, error) ||
+          !TimeOf(high, locale, f.upperTime, error)) {
+        return false;
+      }
+      break;
+    case FilterControls::PopupValue:
+      if (!PopupChoiceOf(db, field, text, f.popupChoice, error)) return false;
+      break;
+    case FilterControls::CheckValue:
+      if (text != "0" && text != "1") {
+        error = "A check box filter takes 1 (checked) or 0 (not checked), not " + Quote(text);
+        return false;
+      }
+      f.checked = text == "1";
+      break;
+    case FilterControls::None:
+      error = "A field of type " + std::string(FieldTypeLabel(db.schema().field[field].type())) +
+              " has no value to filter on";
+      return false;
+  }
+  filter = f;
+  return true;
 }
 
 void DisableBothFilters(Database& db) {

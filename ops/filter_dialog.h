@@ -6,8 +6,10 @@
 #include <array>
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 #include "engine/record_store.h"
+#include "platform/locale_info.h"
 
 namespace cx {
 
@@ -63,6 +65,16 @@ FilterDialogValues OpenFilterDialog(const Database& db);
 // the switches, NOT flags and AND/OR, and marks the database changed. The
 // caller then rebuilds the view.
 void AcceptFilterDialog(Database& db, const FilterDialogValues& values);
+
+// A filter's value written as one text, read by the controls that
+// `field`'s type shows: the "Must Contain" text; "LOW..HIGH" for limits
+// (whole or decimal numbers, or dates or times in `locale`'s patterns); a
+// pop-up entry's text (case ignored when no entry matches exactly) or "No
+// Value"; "1" or "0" for a check box. Sets `filter.field` and the controls
+// of that type, leaving the others; false, with `error` saying why, when
+// the text does not fit the type (the filter is then unchanged).
+bool ReadFilterValueText(const Database& db, int field, std::string_view text, const LocaleInfo& locale,
+                         FilterDialogFilter& filter, std::string& error);
 
 // "Disable both filters".
 void DisableBothFilters(Database& db);

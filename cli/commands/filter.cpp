@@ -1,18 +1,14 @@
-// filter FILE [...]: show or set the two filters, as the "Edit Filters"
-// dialog does.
-#include <cstdio>
+// filter FILE [...]: show the two filters, or set them as the "Edit
+// Filters" dialog's OK does.
 #include <ostream>
 
 #include "cli/args.h"
 #include "cli/command.h"
-#include "cli/commands/design_common.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
 #include "engine/value_text.h"
 #include "ops/database_settings.h"
 #include "ops/filter_dialog.h"
-#include "ops/open_database.h"
-#include "ops/value_parse.h"
 #include "ops/view.h"
 #include "platform/text_codec.h"
 
@@ -21,11 +17,10 @@ namespace {
 
 std::string Quoted(const std::string& cp1252) { return "\"" + Cp1252ToUtf8(cp1252) + "\""; }
 
-std::string TimeText24(const TimeOfDay& t) {
-  if (t.hours == format::kNoTimeHours) return "No Time";
-  char buf[16];
-  std::snprintf(buf, sizeof buf, "%d:%02d:%02d", t.hours, t.minutes, t.seconds);
-  return buf;
+// In the global options' time format, so that what is shown can be typed
+// back as a limit.
+std::string LimitTimeText(const TimeOfDay& t, const LocaleInfo& locale) {
+  return Cp1252ToUtf8(TimeText(t.seconds, t.minutes, t.hours, locale));
 }
 
 class FilterCommand : public Command {
@@ -34,148 +29,87 @@ class FilterCommand : public Command {
   std::string summary() const override { return "show or set the two filters"; }
   std::string help() const override {
     return "Usage: cardovex-cli [--json] filter FILE\n"
-           "       cardovex-cli filter FILE [--1 FIELD] [--2 FIELD] [VALUES] [--not1] [--not2]\n"
-           "                    [--and|--or] [--on1] [--on2] [--off1] [--off2] [--off]\n"
+           "       cardovex-cli filter FILE [--filter1 SPEC] [--filter2 SPEC] [--not1] [--not2]\n"
+           "                    [--or]\n"
+           "       cardovex-cli filter FILE --off\n"
            "Without options: shows both filters and how many records are in view.\n"
-           "Otherwise changes them as the Edit Filters dialog does, saves FILE and shows\n"
-           "the result.\n"
-           "  --1 FIELD, --2 FIELD   switch filter 1 (2) on for FIELD (slot number or\n"
-           "                         name); its NOT is then off unless --not1 (--not2)\n"
-           "  --not1, --not2         the filter's \"NOT\"\n"
-           "  --and, --or            how the two filters combine\n"
-           "  --on1, --on2           switch a filter on as it is stored\n"
-           "  --off1, --off2, --off  switch one or both filters off (settings are kept)\n"
-           "VALUES, per filter n (1 or 2), by the type of its field; values not given\n"
-           "keep what is stored:\n"
-           "  --containsN TEXT       Text, Note, DB Popup, Linked: \"Must Contain\"\n"
-           "                         (empty: only records whose value is empty)\n"
-           "  --lowN V, --highN V    Integer, Unique, Float, Calculated: the limits;\n"
-           "                         Date: dates in the short date format (\"NO DATE\"\n"
-           "                         for none); Time: times such as 9:30 or 5:15:00 PM\n"
-           "  --valueN V             Pop-Up: an entry's text, #N for entry N, or\n"
-           "                         \"No Value\" (on filter 2 it matches nothing);\n"
-           "                         Check-Box: checked/unchecked, yes/no, 1/0\n";
+           "Otherwise stores the filters as the Edit Filters dialog's OK does, saves FILE\n"
+           "and shows the result. The command line is the whole dialog: a filter not\n"
+           "named is switched off (its settings are kept), NOT and OR are off unless\n"
+           "given.\n"
+           "  --filter1 SPEC, --filter2 SPEC   switch the filter on with SPEC\n"
+           "  --not1, --not2   the filter's \"NOT\" (needs its --filterN)\n"
+           "  --or             combine the filters with OR (otherwise AND)\n"
+           "  --off            switch both filters off, changing nothing else\n"
+           "SPEC is FIELD=VALUE, FIELD a slot number (0-29) or a field name, VALUE by\n"
+           "the field's type:\n"
+           "  Text, Note, DB Popup, Linked   the \"Must Contain\" text, case ignored\n"
+           "                                 (empty: only records whose value is empty)\n"
+           "  Integer, Unique, Float and numeric Calculated   LOW..HIGH, e.g. 10..20\n"
+           "                                 or -1.5..2.25 (\".\" as the point)\n"
+           "  Date, Time and date or time Calculated   LOW..HIGH in the date or time\n"
+           "                                 format of the global options\n"
+           "                                 (--date-format, --time-format)\n"
+           "  Pop-Up                         an entry's text, or \"No Value\" (on filter\n"
+           "                                 2 that matches no record)\n"
+           "  Check-Box                      1 (checked) or 0 (not checked)\n"
+           "'records FILE' then lists exactly the records in view.\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv,
-              {"--1", "--2", "--contains1", "--contains2", "--low1", "--low2", "--high1", "--high2",
-               "--value1", "--value2"},
-              {"--not1", "--not2", "--and", "--or", "--on1", "--on2", "--off1", "--off2", "--off"});
+    Args args(argv, {"--filter1", "--filter2"}, {"--not1", "--not2", "--or", "--off"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
-    if (args.has("--and") && args.has("--or")) return UsageError(ctx, *this, "--and and --or together");
+    const bool setting = args.has("--filter1") || args.has("--filter2") || args.has("--not1") ||
+                         args.has("--not2") || args.has("--or");
+    if (args.has("--off") && setting) return UsageError(ctx, *this, "--off goes alone");
+    for (const char* k : {"1", "2"}) {
+      const std::string filter = std::string("--filter") + k, negate = std::string("--not") + k;
+      if (args.values(filter).size() > 1) return UsageError(ctx, *this, filter + " given twice");
+      if (args.has(negate) && !args.has(filter)) return UsageError(ctx, *this, negate + " needs " + filter);
+    }
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     DataSession session(db, ctx.locale, ctx.ui);
-    RunPendingWork(session);
+    if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
 
-    FilterDialogValues values = OpenFilterDialog(db);
-    bool changing = false;
-    for (int n = 0; n < 2; ++n) {
-      const std::string k = std::to_string(n + 1);
-      FilterDialogFilter& f = values.filter[n];
-      if (auto field = args.value("--" + k)) {
-        f.field = ResolveField(db, *field);
-        if (f.field < 0) return UsageError(ctx, *this, "no field " + *field);
-        f.enabled = true;
-        f.notChecked = false;
-        changing = true;
-      }
-      for (const char* flag : {"--not", "--on", "--off"}) {
-        if (!args.has(flag + k)) continue;
-        changing = true;
-        if (std::string(flag) == "--not") f.notChecked = true;
-        if (std::string(flag) == "--on") f.enabled = true;
-        if (std::string(flag) == "--off") f.enabled = false;
-      }
-      std::string error;
-      if (!ApplyValues(ctx, args, db, n, f, changing, error)) return UsageError(ctx, *this, error);
-    }
-    if (args.has("--and") || args.has("--or")) {
-      values.orBetween = args.has("--or");
-      changing = true;
-    }
     if (args.has("--off")) {
-      values.filter[0].enabled = values.filter[1].enabled = false;
-      changing = true;
-    }
-    if (changing) {
+      DisableBothFilters(db);
+    } else if (setting) {
+      FilterDialogValues values = OpenFilterDialog(db);
+      for (int n = 0; n < 2; ++n) {
+        const std::string k = std::to_string(n + 1);
+        FilterDialogFilter& f = values.filter[n];
+        f.enabled = args.has("--filter" + k);
+        f.notChecked = args.has("--not" + k);
+        if (!f.enabled) continue;
+        std::string error;
+        if (!ReadSpec(ctx, db, *args.value("--filter" + k), f, error)) {
+          return UsageError(ctx, *this, "--filter" + k + ": " + error);
+        }
+      }
+      values.orBetween = args.has("--or");
       AcceptFilterDialog(db, values);
-      if (!SaveForCommand(ctx, db)) return kExitFailed;
-      values = OpenFilterDialog(db);
     }
-    Show(ctx, db, values, RebuildView(db).size());
+    if ((setting || args.has("--off")) && !SaveForCommand(ctx, db)) return kExitFailed;
+    session.view = RebuildView(db, session.Link());
+    Show(ctx, db, OpenFilterDialog(db), session.view.size());
     return kExitOk;
   }
 
  private:
-  static bool ApplyValues(Context& ctx, const Args& args, const Database& db, int n, FilterDialogFilter& f,
-                          bool& changing, std::string& error) {
-    const std::string k = std::to_string(n + 1);
-    const FilterControls controls = FilterControlsFor(db.schema(), f.field);
-    auto given = [&](const std::string& option, std::initializer_list<FilterControls> fits) {
-      auto v = args.value("--" + option + k);
-      if (!v) return std::optional<std::string>();
-      changing = true;
-      for (FilterControls c : fits) {
-        if (c == controls) return v;
-      }
-      error = "--" + option + k + " does not apply to a field of type " +
-              std::string(FieldTypeLabel(db.schema().field[f.field].type()));
-      return std::optional<std::string>();
-    };
-    if (auto v = given("contains", {FilterControls::MustContain})) f.mustContain = Utf8ToCp1252(*v);
-    for (bool low : {true, false}) {
-      auto v = given(low ? "low" : "high", {FilterControls::WholeLimits, FilterControls::DecimalLimits,
-                                            FilterControls::DateLimits, FilterControls::TimeLimits});
-      if (!v) continue;
-      if (controls == FilterControls::DateLimits) {
-        uint32_t day = 0;
-        if (*v != "NO DATE" && *v != "0") {
-          auto date = ParseDateText(*v, ctx.locale);
-          if (!date) return (error = "not a date: " + *v), false;
-          day = DateToDayNumber(*date);
-        }
-        (low ? f.lowerDay : f.upperDay) = day;
-      } else if (controls == FilterControls::TimeLimits) {
-        TimeOfDay t{format::kNoTimeHours, 0, 0};
-        if (*v != "No Time") {
-          auto time = ParseTimeText(*v, ctx.locale);
-          if (!time || time->hours > 254 || time->minutes > 59 || time->seconds > 59) {
-            return (error = "not a time: " + *v), false;
-          }
-          t = {uint8_t(time->hours), uint8_t(time->minutes), uint8_t(time->seconds)};
-        }
-        (low ? f.lowerTime : f.upperTime) = t;
-      } else {
-        (low ? f.lowerLimit : f.upperLimit) = Utf8ToCp1252(*v);
-      }
-    }
-    if (auto v = given("value", {FilterControls::PopupValue, FilterControls::CheckValue})) {
-      if (controls == FilterControls::CheckValue) {
-        std::optional<bool> on = *v == "checked" ? true : *v == "unchecked" ? false : ParseSwitch(*v);
-        if (!on) return (error = "--value" + k + " takes checked or unchecked"), false;
-        f.checked = *on;
-      } else if (!PopupChoice(db, f.field, *v, f.popupChoice)) {
-        return (error = "no entry " + *v + " in the popup list"), false;
-      }
-    }
-    return error.empty();
-  }
-
-  static bool PopupChoice(const Database& db, int field, const std::string& text, int& choice) {
-    const auto& items = db.popups()[field].items;
-    if (text == "No Value") return (choice = kNoValueChoice), true;
-    if (text.size() > 1 && text[0] == '#') {
-      auto n = ParseNumber(text.substr(1));
-      if (n && *n >= 0 && static_cast<size_t>(*n) < items.size()) return (choice = int(*n)), true;
+  // FIELD=VALUE; a field name may itself hold "=", so each "=" is tried
+  // until the text before it names a field.
+  static bool ReadSpec(const Context& ctx, const Database& db, const std::string& spec, FilterDialogFilter& f,
+                       std::string& error) {
+    for (size_t eq = spec.find('='); eq != std::string::npos; eq = spec.find('=', eq + 1)) {
+      const int field = ResolveField(db, spec.substr(0, eq));
+      if (field < 0) continue;
+      if (ReadFilterValueText(db, field, Utf8ToCp1252(spec.substr(eq + 1)), ctx.locale, f, error)) return true;
+      error = Cp1252ToUtf8(error);
       return false;
     }
-    const std::string wanted = Utf8ToCp1252(text);
-    for (size_t i = 0; i < items.size(); ++i) {
-      if (items[i] == wanted) return (choice = int(i)), true;
-    }
+    error = spec.find('=') == std::string::npos ? "SPEC is FIELD=VALUE"
+                                                : "no field " + spec.substr(0, spec.find('='));
     return false;
   }
 
@@ -188,9 +122,9 @@ class FilterCommand : public Command {
       case FilterControls::DecimalLimits:
         return Cp1252ToUtf8(f.lowerLimit) + " to " + Cp1252ToUtf8(f.upperLimit);
       case FilterControls::DateLimits:
-        return DateText(f.lowerDay, ctx.locale) + " to " + DateText(f.upperDay, ctx.locale);
+        return Cp1252ToUtf8(DateText(f.lowerDay, ctx.locale) + " to " + DateText(f.upperDay, ctx.locale));
       case FilterControls::TimeLimits:
-        return TimeText24(f.lowerTime) + " to " + TimeText24(f.upperTime);
+        return LimitTimeText(f.lowerTime, ctx.locale) + " to " + LimitTimeText(f.upperTime, ctx.locale);
       case FilterControls::PopupValue:
         return "value " + (f.popupChoice == kNoValueChoice
                                ? std::string("\"No Value\"")

@@ -1,5 +1,5 @@
-// find FILE TEXT: "Search Database" / "Repeat the current Find" from the
-// command line, without changing the file.
+// find FILE TEXT: "Search Database", then "Repeat the current Find" until
+// nothing more is found; every hit is printed.
 #include <ostream>
 
 #include "cli/args.h"
@@ -7,67 +7,72 @@
 #include "cli/database_access.h"
 #include "cli/json.h"
 #include "ops/find.h"
-#include "ops/open_database.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {
 namespace {
+
+// What the search settings keep of the text (the dialog's box takes no
+// more); a longer text would be searched for in full once and cut after.
+constexpr size_t kSearchTextMax = 34;
 
 class FindCommand : public Command {
  public:
   std::string name() const override { return "find"; }
   std::string summary() const override { return "search the records in view for a text"; }
   std::string help() const override {
-    return "Usage: cardovex-cli [--json] find FILE TEXT [--field F] [--case] [--begins]\n"
-           "                    [--from N] [--all]\n"
-           "Searches the records in view (those that pass FILE's filters), in table\n"
-           "order from record N (default 0), for TEXT in each field's text as the list\n"
-           "shows it, and prints the first hit: record index, field slot, field name.\n"
-           "  --field F   search only field F (slot number or name); default all fields\n"
-           "  --case      case-sensitive (otherwise letters A-Z match either case)\n"
-           "  --begins    the field's text must begin with TEXT\n"
-           "  --from N    start at record N; the search never wraps around to record 0\n"
-           "  --all       every record with a hit, each once (the first matching field)\n"
-           "Integer and Unique fields match only a TEXT of digits; a Check-Box matches\n"
-           "\"1\" when checked and \"0\" when not. The file is not changed.\n"
-           "Exit status 1 and \"Not Found in Database!\" when nothing matches.\n";
+    return "Usage: cardovex-cli [--json] find FILE TEXT [--field F] [--case-sensitive]\n"
+           "                    [--begins-with]\n"
+           "Stores the search settings in FILE as the Search Database dialog does and\n"
+           "saves it, searches from the first record, then repeats the find until\n"
+           "nothing more is found, and prints every hit in table order.\n"
+           "  --field F          search only field F (slot number 0-29 or name);\n"
+           "                     default \"Search All Fields\"\n"
+           "  --case-sensitive   letters must match in case (otherwise A-Z match\n"
+           "                     either case)\n"
+           "  --begins-with      the field's text must begin with TEXT\n"
+           "Only the records in view (those that pass the filters) are searched, each\n"
+           "field as the list shows it. Integer and Unique fields match only a TEXT of\n"
+           "digits; a Check-Box matches \"1\" when checked and \"0\" when not.\n"
+           "Each repeat starts at field 0 of the record after the last hit, so a\n"
+           "record is reported once, with its first matching field.\n"
+           "Output: one \"INDEX<TAB>SLOT<TAB>FIELD NAME\" line per hit; with --json\n"
+           "[{\"index\": N, \"slot\": S}, ...]. The search ends with \"Not Found in\n"
+           "Database!\" on stderr. Exit status 0 when there was a hit, 1 when none.\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--field", "--from"}, {"--case", "--begins", "--all"});
+    Args args(argv, {"--field"}, {"--case-sensitive", "--begins-with"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TEXT");
-    Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
-    DataSession session(db, ctx.locale, ctx.ui);
-    RunPendingWork(session);
-
     SearchSettings search;
     search.text = Utf8ToCp1252(args.positional()[1]);
-    search.caseSensitive = args.has("--case");
-    search.beginsWith = args.has("--begins");
+    if (search.text.empty()) return UsageError(ctx, *this, "TEXT is empty");
+    if (search.text.size() > kSearchTextMax) {
+      return UsageError(ctx, *this, "TEXT has more than " + std::to_string(kSearchTextMax) + " characters");
+    }
+    search.caseSensitive = args.has("--case-sensitive");
+    search.beginsWith = args.has("--begins-with");
+
+    Database db;
+    DataSession session(db, ctx.locale, ctx.ui);
+    if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
     if (auto f = args.value("--field")) {
       search.field = ResolveField(db, *f);
       if (search.field < 0) return UsageError(ctx, *this, "no field " + *f);
     }
-    int from = 0;
-    if (auto n = args.value("--from")) {
-      auto v = ParseNumber(*n);
-      if (!v || *v < 0) return UsageError(ctx, *this, "--from takes a record index");
-      from = static_cast<int>(*v);
-    }
 
     std::vector<FindHit> hits;
-    FindHit hit;
-    while (FindRecord(db, search, from, 0, &hit, session.Link(), hits.empty() ? &ctx.ui : nullptr,
-                      ctx.locale) >= 0) {
-      hits.push_back(hit);
-      if (!args.has("--all")) break;
-      from = hit.index + 1;
+    // Every repeat moves on by at least one record, so the bound is never
+    // reached; it only guards against a search that would not move on.
+    const size_t bound = db.recordCount() * format::kFieldCount + 1;
+    for (int found = SearchDatabase(session, search); found >= 0 && hits.size() < bound;
+         found = RepeatFind(session)) {
+      hits.push_back(session.found);
     }
-    if (hits.empty()) return kExitFailed;
+    if (!SaveForCommand(ctx, db)) return kExitFailed;
     Print(ctx, db, hits);
-    return kExitOk;
+    return hits.empty() ? kExitFailed : kExitOk;
   }
 
  private:
@@ -79,8 +84,6 @@ class FindCommand : public Command {
         j.BeginObject();
         j.Key("index").Number(h.index);
         j.Key("slot").Number(h.field);
-        j.Key("name").String(Cp1252ToUtf8(db.schema().field[h.field].name.str()));
-        j.Key("column").Number(h.column);
         j.EndObject();
       }
       j.EndArray();

@@ -5,11 +5,9 @@
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
-#include "cli/json.h"
+#include "cli/record_output.h"
 #include "design/link_access.h"
-#include "engine/value_text.h"
 #include "ops/links.h"
-#include "platform/text_codec.h"
 
 namespace cx::cli {
 namespace {
@@ -55,56 +53,8 @@ class LinkedCommand : public Command {
     } else {
       for (uint32_t i : RebuildView(other, &linked.restriction())) rows.push_back(i);
     }
-    Write(ctx, other, rows);
+    WriteRecords(ctx, other, rows);
     return kExitOk;
-  }
-
- private:
-  static void Write(Context& ctx, const Database& db, const std::vector<size_t>& rows) {
-    std::vector<int> slots;
-    for (uint8_t slot : db.schema().fieldOrder) {
-      if (db.schema().field[slot].type() != FieldType::NotUsed) slots.push_back(slot);
-    }
-    const ValueContext vc{db.schema(), db.popups(), ctx.locale};
-    if (ctx.json) {
-      JsonWriter j(ctx.out);
-      j.BeginArray();
-      for (size_t row : rows) {
-        j.BeginObject();
-        j.Key("index").Number(static_cast<int64_t>(row));
-        j.Key("fields").BeginArray();
-        for (int slot : slots) {
-          j.BeginObject();
-          j.Key("slot").Number(slot);
-          j.Key("name").String(Cp1252ToUtf8(db.schema().field[slot].name.str()));
-          j.Key("text").String(Cp1252ToUtf8(ValueText(vc, db.record(row), slot)));
-          j.EndObject();
-        }
-        j.EndArray();
-        j.EndObject();
-      }
-      j.EndArray();
-      j.Finish();
-      return;
-    }
-    std::string line;
-    for (size_t k = 0; k < slots.size(); ++k) {
-      if (k) line.push_back('\t');
-      line += Cp1252ToUtf8(db.schema().field[slots[k]].name.str());
-    }
-    ctx.out << line << "\n";
-    for (size_t row : rows) {
-      line.clear();
-      for (size_t k = 0; k < slots.size(); ++k) {
-        if (k) line.push_back('\t');
-        std::string text = OneLine(ValueText(vc, db.record(row), slots[k]));
-        for (char& c : text) {
-          if (c == '\t') c = ' ';
-        }
-        line += Cp1252ToUtf8(text);
-      }
-      ctx.out << line << "\n";
-    }
   }
 };
 

@@ -5,7 +5,6 @@
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "ops/calc.h"
-#include "ops/open_database.h"
 
 namespace cx::cli {
 namespace {
@@ -16,9 +15,9 @@ class RecalcCommand : public Command {
   std::string summary() const override { return "recompute the calculated fields and save"; }
   std::string help() const override {
     return "Usage: cardovex-cli recalc FILE\n"
-           "Recomputes the Calculated fields of the records in view (every record when\n"
-           "both filters are off), from the first record in table order, then saves\n"
-           "FILE. When a sort key is a Calculated field the records are sorted again\n"
+           "Runs one full recalculation pass from record 0, in table order, over the\n"
+           "records in view (every record when both filters are off), then saves FILE.\n"
+           "When a sort key is a Calculated field the records are sorted again\n"
            "afterwards and the fields that use the previous record are recomputed in\n"
            "the new order. Results use the decimal separator of the global options.\n";
   }
@@ -28,9 +27,8 @@ class RecalcCommand : public Command {
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     DataSession session(db, ctx.locale, ctx.ui);
-    RunPendingWork(session);
+    if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
     if (RecalculateFrom(session, 0) != 0) return Failure(ctx, "The recalculation stopped early.");
     if (!SaveForCommand(ctx, db)) return kExitFailed;
     ctx.out << "calculated fields recomputed\n";

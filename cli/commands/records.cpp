@@ -5,10 +5,8 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
-#include "cli/json.h"
-#include "engine/value_text.h"
+#include "cli/record_output.h"
 #include "ops/view.h"
-#include "platform/text_codec.h"
 
 namespace cx::cli {
 namespace {
@@ -35,69 +33,15 @@ class RecordsCommand : public Command {
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
 
-    std::vector<int> slots;
-    for (uint8_t slot : db.schema().fieldOrder) {
-      if (db.schema().field[slot].type() != FieldType::NotUsed) slots.push_back(slot);
-    }
-    std::vector<uint32_t> rows;
+    std::vector<size_t> rows;
     if (args.has("--all")) {
       rows.resize(db.recordCount());
-      for (size_t i = 0; i < rows.size(); ++i) rows[i] = static_cast<uint32_t>(i);
+      for (size_t i = 0; i < rows.size(); ++i) rows[i] = i;
     } else {
-      rows = RebuildView(db);
+      for (uint32_t i : RebuildView(db)) rows.push_back(i);
     }
-    ValueContext vc{db.schema(), db.popups(), ctx.locale};
-    if (ctx.json) {
-      WriteJson(ctx, db, vc, slots, rows);
-    } else {
-      WriteTable(ctx, db, vc, slots, rows);
-    }
+    WriteRecords(ctx, db, rows);
     return kExitOk;
-  }
-
- private:
-  static void WriteJson(Context& ctx, const Database& db, const ValueContext& vc,
-                        const std::vector<int>& slots, const std::vector<uint32_t>& rows) {
-    JsonWriter j(ctx.out);
-    j.BeginArray();
-    for (uint32_t row : rows) {
-      j.BeginObject();
-      j.Key("index").Number(row);
-      j.Key("fields").BeginArray();
-      for (int slot : slots) {
-        j.BeginObject();
-        j.Key("slot").Number(slot);
-        j.Key("name").String(Cp1252ToUtf8(db.schema().field[slot].name.str()));
-        j.Key("text").String(Cp1252ToUtf8(ValueText(vc, db.record(row), slot)));
-        j.EndObject();
-      }
-      j.EndArray();
-      j.EndObject();
-    }
-    j.EndArray();
-    j.Finish();
-  }
-
-  static void WriteTable(Context& ctx, const Database& db, const ValueContext& vc,
-                         const std::vector<int>& slots, const std::vector<uint32_t>& rows) {
-    std::string line;
-    for (size_t k = 0; k < slots.size(); ++k) {
-      if (k) line.push_back('\t');
-      line += Cp1252ToUtf8(db.schema().field[slots[k]].name.str());
-    }
-    ctx.out << line << "\n";
-    for (uint32_t row : rows) {
-      line.clear();
-      for (size_t k = 0; k < slots.size(); ++k) {
-        if (k) line.push_back('\t');
-        std::string text = OneLine(ValueText(vc, db.record(row), slots[k]));
-        for (char& c : text) {
-          if (c == '\t') c = ' ';
-        }
-        line += Cp1252ToUtf8(text);
-      }
-      ctx.out << line << "\n";
-    }
   }
 };
 

@@ -4,7 +4,6 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
-#include "ops/open_database.h"
 #include "ops/sort.h"
 #include "platform/text_codec.h"
 
@@ -21,12 +20,12 @@ class SortCommand : public Command {
            "does, sorts the records, recalculates what depends on their order and\n"
            "saves FILE. KEY is a slot number (0-29) or a field name (case ignored),\n"
            "optionally followed by \":reverse\" (or \":forward\", the default); keys not\n"
-           "given are set to \"No Field\".\n"
+           "given are set to \"No Field\". A KEY that names no field is a usage error.\n"
            "Each key is checked as the dialog checks it: a Not-Used, Image, Link or\n"
            "Heading field, and a Calculated field whose value depends on the previous\n"
-           "record, cannot be a sort key; the dialog's message is shown and nothing\n"
-           "changes. As in the dialog, the tertiary key always takes the primary key's\n"
-           "direction.\n"
+           "record, cannot be a sort key; the dialog's message goes to stderr, FILE\n"
+           "is left as it was and the exit status is 1. As in the dialog, the tertiary\n"
+           "key always takes the primary key's direction.\n"
            "Records that compare equal on every key may come out in any order.\n";
   }
 
@@ -36,11 +35,13 @@ class SortCommand : public Command {
     const auto& p = args.positional();
     if (p.size() < 2 || p.size() > 4) return UsageError(ctx, *this, "expected FILE and one to three KEYs");
     Database db;
-    if (!OpenForCommand(ctx, p[0], db)) return kExitFailed;
     DataSession session(db, ctx.locale, ctx.ui);
-    RunPendingWork(session);
+    if (!OpenForCommand(ctx, p[0], session)) return kExitFailed;
 
-    SortingChoice choice;
+    // The dialog as it opens, so that a key left out keeps its stored
+    // direction byte.
+    SortingChoice choice = OpenSortingDialog(db.schema());
+    for (size_t k = 0; k < 3; ++k) choice.entry[k] = 0;
     for (size_t k = 0; k + 1 < p.size(); ++k) {
       int field = -1;
       bool forward = true;

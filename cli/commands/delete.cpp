@@ -1,5 +1,5 @@
-// delete-records FILE --within|--outside|--all: the "Delete Records" dialog
-// from the command line.
+// delete FILE --within|--outside|--all: the "Delete Records" command of the
+// main view, from the command line.
 #include <ostream>
 
 #include "cli/args.h"
@@ -9,18 +9,17 @@
 #include "design/link_access.h"
 #include "ops/delete_records.h"
 #include "ops/links.h"
-#include "ops/open_database.h"
 
 namespace cx::cli {
 namespace {
 
-class DeleteRecordsCmd : public Command {
+class DeleteCommand : public Command {
  public:
-  std::string name() const override { return "delete-records"; }
+  std::string name() const override { return "delete"; }
   std::string summary() const override { return "delete the records within or outside the filter range, or all"; }
   std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] [--yes|--no] delete-records FILE\n"
-           "                    --within|--outside|--all\n"
+    return "Usage: cardovex-cli [--password PW] [--yes|--no] delete FILE\n"
+           "                    --within | --outside | --all\n"
            "Deletes records and saves FILE:\n"
            "  --within    \"All Records _Within_ Filter Range\": the records in view\n"
            "  --outside   \"All Records _Outside_ Filter Range\": the others (none when\n"
@@ -29,7 +28,8 @@ class DeleteRecordsCmd : public Command {
            "Needs the \"Delete Records\" access. When FILE has Link fields the question\n"
            "\"Would you like to delete the linked records also? (Y/N)\" is answered by\n"
            "--yes (the linked records in the other databases go too, each database\n"
-           "under its own access check) or --no; without either nothing is deleted.\n"
+           "under its own access check) or --no; without either it is asked on the\n"
+           "terminal, and with no terminal refused: nothing is deleted, exit status 1.\n"
            "Calculated fields are brought up to date afterwards.\n";
   }
 
@@ -43,19 +43,16 @@ class DeleteRecordsCmd : public Command {
                               : args.has("--outside") ? DeleteScope::OutsideFilterRange
                                                       : DeleteScope::All;
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
-    if (!PassAccessCheck(ctx, db, secured::kDeleteRecords)) return kExitFailed;
     DataSession session(db, ctx.locale, ctx.ui);
-    RunPendingWork(session);
+    if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
+    if (!PassAccessCheck(ctx, db, secured::kDeleteRecords)) return kExitFailed;
 
-    bool alsoLinked = false;
-    if (HasLinkFields(db)) {
-      alsoLinked = ctx.ui.AskYesNo(link_messages::kDeleteLinkedQuestion, "QUESTION");
-      if (!QuestionsAnswered(ctx)) return kExitFailed;
-    }
     LinkServices services = SecuredLinkServices(ctx.ui, &ctx.locale);
     LinkedRecordsDeleter linked(services);
-    const size_t deleted = DeleteRecords(session, scope, alsoLinked ? &linked : nullptr);
+    // An unanswered linked-records question reads as No, which deletes
+    // nothing linked; what was deleted here is then not saved.
+    const size_t deleted = DeleteRecordsCommand(session, scope, &linked);
+    if (!QuestionsAnswered(ctx)) return kExitFailed;
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
     ctx.out << deleted << (deleted == 1 ? " record" : " records") << " deleted, " << db.recordCount()
             << " left\n";
@@ -63,7 +60,7 @@ class DeleteRecordsCmd : public Command {
   }
 };
 
-CX_REGISTER_COMMAND(DeleteRecordsCmd);
+CX_REGISTER_COMMAND(DeleteCommand);
 
 }  // namespace
 }  // namespace cx::cli

@@ -5,8 +5,8 @@
 namespace cx {
 
 bool RecordReader::Open(const std::string& path, size_t count, size_t listOffset) {
-  auto bytes = std::make_shared<std::vector<uint8_t>>();
-  if (!ReadWholeFile(path, *bytes)) return false;
+  auto bytes = std::make_shared<FileBuffer>();
+  if (!bytes->Read(path)) return false;
   return Open(std::move(bytes), count, listOffset);
 }
 
@@ -14,7 +14,7 @@ bool RecordReader::Open(FileImage image, size_t count, size_t listOffset) {
   image_ = std::move(image);
   entries_.clear();
   next_ = 0;
-  const auto& file = *image_;
+  const FileBuffer& file = *image_;
   if (listOffset > file.size() || count > (file.size() - listOffset) / format::kEntrySize) {
     return false;
   }

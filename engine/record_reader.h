@@ -10,10 +10,11 @@
 #include <vector>
 
 #include "engine/container.h"
+#include "platform/file_io.h"
 
 namespace cx {
 
-using FileImage = std::shared_ptr<const std::vector<uint8_t>>;
+using FileImage = std::shared_ptr<const FileBuffer>;
 
 class RecordReader {
  public:

@@ -87,8 +87,8 @@ Status Database::Open(const std::string& path, UiPort& ui) {
     return Status::Error(std::move(message));
   };
 
-  auto image = std::make_shared<Bytes>();
-  if (!ReadWholeFile(path, *image)) return fail(FormatMessage(messages::kCannotOpen, path));
+  auto image = std::make_shared<FileBuffer>();
+  if (!image->Read(path)) return fail(FormatMessage(messages::kCannotOpen, path));
   if (image->size() < format::kHeaderSize) return fail(messages::kBadHeader);
   Database db;
   db.path_ = path;
@@ -198,7 +198,16 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
   out.Write(head.data(), head.size());
   out.Write(schemaBytes.data(), schemaBytes.size());
   for (const Bytes& p : popupBytes) out.Write(p.data(), p.size());
-  for (const DataRecord& r : records_) out.Write(r.bytes().data(), r.size());
+  // Records that still lie side by side in the file they were read from go
+  // out in one write each run (after an unchanged open: the whole data part).
+  for (size_t i = 0; i < records_.size();) {
+    const uint8_t* start = records_[i].bytes().data();
+    size_t run = records_[i].size();
+    size_t j = i + 1;
+    while (j < records_.size() && records_[j].bytes().data() == start + run) run += records_[j++].size();
+    out.Write(start, run);
+    i = j;
+  }
   if (Status s = out.Commit(); !s) return s;
 
   header_ = header;

@@ -2,6 +2,7 @@
 
 #include <dirent.h>
 #include <fcntl.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -54,6 +55,50 @@ bool ReadWholeFile(const std::string& path, std::vector<uint8_t>& out) {
   }
   out.resize(done);  // a file that shrank while being read
   ::close(fd);
+  return true;
+}
+
+FileBuffer::~FileBuffer() {
+  if (data_) ::munmap(data_, mapped_);
+}
+
+bool FileBuffer::Read(const std::string& path) {
+  constexpr size_t kHugePage = 2u << 20;
+  int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+  if (fd < 0) return false;
+  struct stat st{};
+  if (::fstat(fd, &st) != 0 || !S_ISREG(st.st_mode)) {
+    ::close(fd);
+    return false;
+  }
+  size_t want = static_cast<size_t>(st.st_size);
+  size_t mapped = (want + kHugePage - 1) / kHugePage * kHugePage;
+  if (mapped == 0) mapped = kHugePage;
+  void* block = ::mmap(nullptr, mapped, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  if (block == MAP_FAILED) {
+    ::close(fd);
+    return false;
+  }
+  if (mapped >= kHugePage) ::madvise(block, mapped, MADV_HUGEPAGE);
+  auto* bytes = static_cast<uint8_t*>(block);
+  size_t done = 0;
+  bool ok = true;
+  while (done < want) {
+    ssize_t n = ::read(fd, bytes + done, want - done);
+    if (n < 0 && errno == EINTR) continue;
+    if (n < 0) ok = false;
+    if (n <= 0) break;
+    done += static_cast<size_t>(n);
+  }
+  ::close(fd);
+  if (!ok) {
+    ::munmap(block, mapped);
+    return false;
+  }
+  if (data_) ::munmap(data_, mapped_);
+  data_ = bytes;
+  size_ = done;  // a file that shrank while being read
+  mapped_ = mapped;
   return true;
 }
 
@@ -121,32 +166,35 @@ Status SafeFileWriter::Open() {
   return Status::Ok();
 }
 
-bool SafeFileWriter::Flush() {
+bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
   size_t done = 0;
-  while (done < buffer_.size()) {
-    ssize_t n = ::write(fd_, buffer_.data() + done, buffer_.size() - done);
+  while (done < size) {
+    ssize_t n = ::write(fd_, p + done, size - done);
     if (n < 0 && errno == EINTR) continue;
     if (n <= 0) {
       failed_ = true;
       error_ = n < 0 ? ErrnoText() : "short write";
-      buffer_.clear();
       return false;
     }
     done += static_cast<size_t>(n);
   }
-  buffer_.clear();
   return true;
+}
+
+bool SafeFileWriter::Flush() {
+  bool ok = WriteAll(buffer_.data(), buffer_.size());
+  buffer_.clear();
+  return ok;
 }
 
 bool SafeFileWriter::Write(const void* data, size_t size) {
   if (failed_ || fd_ < 0) return false;
+  if (size == 0) return true;
   const uint8_t* p = static_cast<const uint8_t*>(data);
   if (buffer_.size() + size > kWriteBuffer) {
     if (!Flush()) return false;
-    if (size >= kWriteBuffer) {
-      buffer_.assign(p, p + size);
-      return Flush();
-    }
+    // Large blocks go straight to the file rather than through the buffer.
+    if (size >= kWriteBuffer) return WriteAll(p, size);
   }
   buffer_.insert(buffer_.end(), p, p + size);
   return true;

@@ -17,6 +17,27 @@ bool ReadWholeFile(const std::string& path, std::vector<uint8_t>& out);
 // Reads up to `length` bytes starting at `offset`; returns the bytes read
 // (fewer at end of file) or -1 when the file cannot be opened or read.
 int64_t ReadFileRange(const std::string& path, uint64_t offset, size_t length, uint8_t* out);
+// A whole file read into memory that is given back to the system in large
+// pages where it can be: big databases are read in one go, and faulting in
+// their pages one by one costs more than reading them.
+class FileBuffer {
+ public:
+  FileBuffer() = default;
+  ~FileBuffer();
+  FileBuffer(const FileBuffer&) = delete;
+  FileBuffer& operator=(const FileBuffer&) = delete;
+
+  // False when the file cannot be opened or read (the buffer is then empty).
+  bool Read(const std::string& path);
+  const uint8_t* data() const { return data_; }
+  size_t size() const { return size_; }
+
+ private:
+  uint8_t* data_ = nullptr;
+  size_t size_ = 0;
+  size_t mapped_ = 0;
+};
+
 bool RemoveFile(const std::string& path);
 // Names of the regular files in `dir` (not recursive), unsorted.
 std::vector<std::string> ListFiles(const std::string& dir);
@@ -42,6 +63,7 @@ class SafeFileWriter {
 
  private:
   bool Flush();
+  bool WriteAll(const uint8_t* p, size_t size);
 
   std::string target_;
   std::string temp_;

@@ -104,7 +104,8 @@ class FilterCommand : public Command {
     for (size_t eq = spec.find('='); eq != std::string::npos; eq = spec.find('=', eq + 1)) {
       const int field = ResolveField(db, spec.substr(0, eq));
       if (field < 0) continue;
-      if (ReadFilterValueText(db, field, Utf8ToCp1252(spec.substr(eq + 1)), ctx.locale, f, error)) return true;
+      const std::string value = Utf8ToCp1252(spec.substr(eq + 1));
+      if (ReadFilterValueText(db, field, value, ctx.locale, f, error)) return true;
       error = Cp1252ToUtf8(error);
       return false;
     }

@@ -42,7 +42,7 @@ Bytes GeneratedBytes(const std::string& path, uint32_t seed) {
 }
 
 // Starts the saver; returns its pid once it has begun saving, or -1.
-pid_t StartSaver(const std::string& path) {
+pid_t StartSaver(const std::string& target, const std::string& a, const std::string& b) {
   int fds[2];
   if (::pipe(fds) != 0) return -1;
   pid_t pid = ::fork();
@@ -50,10 +50,8 @@ pid_t StartSaver(const std::string& path) {
     ::dup2(fds[1], STDOUT_FILENO);
     ::close(fds[0]);
     ::close(fds[1]);
-    const std::string records = std::to_string(kRecords);
-    const std::string a = std::to_string(kSeedA), b = std::to_string(kSeedB);
-    ::execl(CARDOVEX_KILL_SAVER, CARDOVEX_KILL_SAVER, path.c_str(), records.c_str(), a.c_str(),
-            b.c_str(), static_cast<char*>(nullptr));
+    ::execl(CARDOVEX_KILL_SAVER, CARDOVEX_KILL_SAVER, target.c_str(), a.c_str(), b.c_str(),
+            static_cast<char*>(nullptr));
     ::_exit(127);
   }
   ::close(fds[1]);
@@ -78,12 +76,13 @@ std::vector<std::string> Leftovers(const testing::TempDir& dir, const std::strin
 }
 
 TEST(KillTest, FileIsAlwaysOldOrNewVersion) {
+  // The two versions live in a folder of their own; the saver opens them.
+  testing::TempDir versions;
+  const Bytes versionA = GeneratedBytes(versions.File("A.PDB"), kSeedA);
+  const Bytes versionB = GeneratedBytes(versions.File("B.PDB"), kSeedB);
   testing::TempDir dir;
   const std::string target = "Kill.PDB";
   const std::string path = dir.File(target);
-  const Bytes versionB = GeneratedBytes(dir.File("B.PDB"), kSeedB);
-  RemoveFile(dir.File("B.PDB"));
-  const Bytes versionA = GeneratedBytes(path, kSeedA);
   ASSERT_NE(versionA, versionB);
 
   // Kills are spread over a few saves' time.
@@ -96,7 +95,7 @@ TEST(KillTest, FileIsAlwaysOldOrNewVersion) {
   int leftA = 0, leftB = 0, midWrite = 0;
   for (int kill = 0; kill < kKills; ++kill) {
     ASSERT_TRUE(WriteFileSafely(path, versionA.data(), versionA.size()).ok());
-    pid_t pid = StartSaver(path);
+    pid_t pid = StartSaver(path, versions.File("A.PDB"), versions.File("B.PDB"));
     ASSERT_GT(pid, 0) << "the saver did not start";
     std::this_thread::sleep_for(std::chrono::microseconds(rng() % maxDelay));
     ASSERT_EQ(::kill(pid, SIGKILL), 0);

@@ -56,9 +56,14 @@ const std::string& GeneratedFile(size_t records) {
   return files.Get(records);
 }
 
+void SetItems(benchmark::State& state) {
+  state.SetItemsProcessed(state.iterations() * state.range(0));
+  state.SetComplexityN(state.range(0));
+}
+
 void SetBytes(benchmark::State& state, const std::string& path) {
   state.SetBytesProcessed(state.iterations() * FileSize(path));
-  state.SetItemsProcessed(state.iterations() * state.range(0));
+  SetItems(state);
 }
 
 void BM_Open(benchmark::State& state) {
@@ -100,7 +105,7 @@ void BM_ValueTextAll(benchmark::State& state) {
     }
     benchmark::DoNotOptimize(total);
   }
-  state.SetItemsProcessed(state.iterations() * state.range(0));
+  SetItems(state);
 }
 
 // Every record into the editing form and compacted back, as the record
@@ -116,7 +121,7 @@ void BM_EditRoundTrip(benchmark::State& state) {
     }
     benchmark::DoNotOptimize(total);
   }
-  state.SetItemsProcessed(state.iterations() * state.range(0));
+  SetItems(state);
 }
 
 // The summary report on a whole number, a decimal and a date field.
@@ -132,7 +137,7 @@ void BM_Report(benchmark::State& state) {
       benchmark::DoNotOptimize(report);
     }
   }
-  state.SetItemsProcessed(state.iterations() * state.range(0));
+  SetItems(state);
 }
 
 #define CARDOVEX_SIZES ->Arg(4096)->Arg(16384)->Arg(65504)->Unit(benchmark::kMillisecond)

@@ -91,7 +91,7 @@ cp "$WORK/work.db" "$WORK/sorted.db"
 
 # filter
 cx_filter_prepare() { cp "$WORK/sorted.PDB" "$WORK/work.PDB"; }
-cx_filter() { cx filter "$WORK/work.PDB" --1 Name --contains1 an --2 Quantity --low2 100 --high2 50000 --and; }
+cx_filter() { cx filter "$WORK/work.PDB" --filter1 Name=an --filter2 Quantity=100..50000; }
 sq_filter_prepare() { :; }
 sq_filter() { sqlite3 "$WORK/sorted.db" "select count(*) from items where $WHERE;"; }
 step filter cx_filter_prepare cx_filter; CX_FILTER=$BEST

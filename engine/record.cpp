@@ -75,6 +75,20 @@ std::optional<ByteView> FieldValue(ByteView record, int fieldSlot) {
   return record.subspan(static_cast<size_t>(off), std::min(len, avail));
 }
 
+std::array<std::optional<ByteView>, format::kFieldCount> FieldValues(ByteView record) {
+  std::array<std::optional<ByteView>, format::kFieldCount> values{};
+  size_t off = DataStart(record);
+  for (int i = 0; i < format::kFieldCount; ++i) {
+    if (off + 2 > record.size()) break;
+    size_t len = GetLE16(record.data() + off);
+    if (len == format::kEndMark) break;
+    size_t avail = record.size() - (off + 2);
+    values[i] = record.subspan(off + 2, std::min(len, avail));
+    off += 2 + len;
+  }
+  return values;
+}
+
 bool RecordIsWellFormed(ByteView record) {
   if (record.empty()) return true;  // no slots at all: every value reads empty
   size_t off = DataStart(record);

@@ -6,6 +6,7 @@
 #pragma once
 
 #include <cstdint>
+#include <array>
 #include <optional>
 #include <span>
 #include <string>
@@ -30,6 +31,9 @@ int FieldLength(ByteView record, int fieldSlot);
 // The slot's value bytes, cut at the end of the record; nothing when the
 // record does not contain the slot.
 std::optional<ByteView> FieldValue(ByteView record, int fieldSlot);
+// Every slot's value in one walk over the record (what FieldValue gives
+// for each slot), for code that looks at many fields of one record.
+std::array<std::optional<ByteView>, format::kFieldCount> FieldValues(ByteView record);
 // False when a slot's length runs past the end of the record.
 bool RecordIsWellFormed(ByteView record);
 

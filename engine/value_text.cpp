@@ -10,30 +10,46 @@
 namespace cx {
 namespace {
 
-std::vector<std::string> Tokens(const std::string& pattern, char separator, size_t count) {
-  std::vector<std::string> tokens;
+// Up to three tokens of a pattern cut at `separator`, as views into it.
+struct PatternTokens {
+  std::string_view token[3];
+  size_t count = 0;
+};
+
+PatternTokens Tokens(std::string_view pattern, char separator) {
+  PatternTokens t;
   size_t start = 0;
-  while (tokens.size() < count && start <= pattern.size()) {
+  while (t.count < 3 && start <= pattern.size()) {
     size_t end = pattern.find(separator, start);
-    if (end == std::string::npos) {
-      if (start < pattern.size()) tokens.push_back(pattern.substr(start));
+    if (end == std::string_view::npos) {
+      if (start < pattern.size()) t.token[t.count++] = pattern.substr(start);
       break;
     }
-    tokens.push_back(pattern.substr(start, end - start));
+    t.token[t.count++] = pattern.substr(start, end - start);
     start = end + 1;
   }
-  return tokens;
+  return t;
 }
 
-std::string Lower(std::string s) {
-  for (char& c : s) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
-  return s;
+bool EqualsIgnoringCase(std::string_view a, std::string_view lower) {
+  if (a.size() != lower.size()) return false;
+  for (size_t i = 0; i < a.size(); ++i) {
+    if (std::tolower(static_cast<unsigned char>(a[i])) != lower[i]) return false;
+  }
+  return true;
 }
 
-std::string Format(const char* fmt, long value) {
-  char buf[32];
-  std::snprintf(buf, sizeof buf, fmt, value);
-  return buf;
+// "%d" (digits 1) or "%02d" (digits 2) of a value that is never negative.
+void AppendNumber(std::string& out, long value, int digits) {
+  char buf[24];
+  int n = 0;
+  unsigned long v = value < 0 ? 0 : static_cast<unsigned long>(value);
+  do {
+    buf[n++] = static_cast<char>('0' + v % 10);
+    v /= 10;
+  } while (v);
+  while (n < digits) buf[n++] = '0';
+  while (n) out.push_back(buf[--n]);
 }
 
 }  // namespace
@@ -41,23 +57,23 @@ std::string Format(const char* fmt, long value) {
 std::string DateText(uint32_t dayNumber, const LocaleInfo& locale) {
   CalendarDate d = DayNumberToDate(dayNumber);
   if (d.month <= 1 && d.day <= 1 && d.year <= 1904) return "NO DATE";
-  std::vector<std::string> tokens = Tokens(locale.shortDate, locale.dateSeparator, 3);
+  PatternTokens tokens = Tokens(locale.shortDate, locale.dateSeparator);
   std::string out;
-  for (size_t i = 0; i < tokens.size(); ++i) {
+  for (size_t i = 0; i < tokens.count; ++i) {
     if (i > 0) out.push_back(locale.dateSeparator);
-    std::string t = Lower(tokens[i]);
-    if (t == "m") {
-      out += Format("%ld", d.month);
-    } else if (t == "mm" || t == "mmm") {  // a number even for "mmm"
-      out += Format("%02ld", d.month);
-    } else if (t == "d") {
-      out += Format("%ld", d.day);
-    } else if (t == "dd") {
-      out += Format("%02ld", d.day);
-    } else if (t == "yy") {
-      out += Format("%02ld", d.year % 100);
-    } else if (t == "yyyy") {
-      out += Format("%04ld", d.year);
+    std::string_view t = tokens.token[i];
+    if (EqualsIgnoringCase(t, "m")) {
+      AppendNumber(out, d.month, 1);
+    } else if (EqualsIgnoringCase(t, "mm") || EqualsIgnoringCase(t, "mmm")) {
+      AppendNumber(out, d.month, 2);  // a number even for "mmm"
+    } else if (EqualsIgnoringCase(t, "d")) {
+      AppendNumber(out, d.day, 1);
+    } else if (EqualsIgnoringCase(t, "dd")) {
+      AppendNumber(out, d.day, 2);
+    } else if (EqualsIgnoringCase(t, "yy")) {
+      AppendNumber(out, d.year % 100, 2);
+    } else if (EqualsIgnoringCase(t, "yyyy")) {
+      AppendNumber(out, d.year, 4);
     }
   }
   return out;
@@ -67,23 +83,23 @@ std::string TimeText(uint8_t seconds, uint8_t minutes, uint8_t hours, const Loca
   if (hours == format::kNoTimeHours) return "No Time";
   const bool twelve = locale.timeFormat.find("tt") != std::string::npos;
   const long h12 = hours == 0 ? 12 : (hours > 12 ? hours - 12 : hours);
-  std::vector<std::string> tokens = Tokens(locale.timeFormat, locale.timeSeparator, 3);
+  PatternTokens tokens = Tokens(locale.timeFormat, locale.timeSeparator);
   std::string out;
-  for (size_t i = 0; i < tokens.size(); ++i) {
+  for (size_t i = 0; i < tokens.count; ++i) {
     if (i > 0) out.push_back(locale.timeSeparator);
-    const std::string& t = tokens[i];
+    std::string_view t = tokens.token[i];
     if (t == "h") {
-      out += Format("%ld", twelve ? h12 : (hours == 0 ? 12 : long(hours)));
+      AppendNumber(out, twelve ? h12 : (hours == 0 ? 12 : long(hours)), 1);
     } else if (t == "hh") {
-      out += Format("%02ld", twelve ? h12 : long(hours));
+      AppendNumber(out, twelve ? h12 : long(hours), 2);
     } else if (t == "H") {
-      out += Format("%ld", hours);
+      AppendNumber(out, hours, 1);
     } else if (t == "HH") {
-      out += Format("%02ld", hours);
+      AppendNumber(out, hours, 2);
     } else if (t == "mm") {
-      out += Format("%02ld", minutes);
-    } else if (t.find("ss") != std::string::npos) {
-      out += Format("%02ld", seconds);
+      AppendNumber(out, minutes, 2);
+    } else if (t.find("ss") != std::string_view::npos) {
+      AppendNumber(out, seconds, 2);
     }
   }
   if (twelve) {
@@ -132,8 +148,12 @@ int DecimalPlaces(const FieldDef& field) {
 
 std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot) {
   if (fieldSlot < 0 || fieldSlot >= format::kFieldCount) return "";
+  return ValueTextOf(ctx, fieldSlot, FieldValue(record, fieldSlot));
+}
+
+std::string ValueTextOf(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value) {
+  if (fieldSlot < 0 || fieldSlot >= format::kFieldCount) return "";
   const FieldDef& field = ctx.schema.field[fieldSlot];
-  std::optional<ByteView> value = FieldValue(record, fieldSlot);
   if (!value) return field.type() == FieldType::Calculated ? "Error!" : "";
   switch (field.type()) {
     case FieldType::NotUsed:

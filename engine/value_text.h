@@ -23,6 +23,9 @@ struct ValueContext {
 // The text of slot `fieldSlot` of a stored record. A slot the record does
 // not contain gives an empty text (a Calculated one "Error!").
 std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot);
+// The same for a value already found in its record (FieldValue, or one of
+// FieldValues); nothing stands for a slot the record does not contain.
+std::string ValueTextOf(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value);
 
 // "NO DATE" for day 0, else the date in the short date pattern's order.
 std::string DateText(uint32_t dayNumber, const LocaleInfo& locale);

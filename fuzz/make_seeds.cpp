@@ -224,9 +224,12 @@ void ObexSeeds(SeedFolder& obex, const std::string& scratch) {
   sessions.push_back(Session("../../etc/passwd", "QrTa", Bytes(10, 'x')));
   sessions.push_back(Session("big.bin", "QrTa", Bytes(9000, 'b')));
   for (const Bytes& s : sessions) {
-    for (uint8_t piece : {0, 1, 7}) {
-      Bytes input{piece};
-      input.insert(input.end(), s.begin(), s.end());
+    // Cut into receives three ways; the target database open on screen; every
+    // question answered No.
+    for (uint8_t piece : {0x00, 0x01, 0x07, 0x40, 0x83}) {
+      Bytes input(s.size() + 1);
+      input[0] = piece;
+      std::copy(s.begin(), s.end(), input.begin() + 1);
       obex.Add(input);
     }
   }

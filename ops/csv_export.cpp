@@ -1,6 +1,7 @@
 #include "ops/csv_export.h"
 
 #include <cstdio>
+#include <cstring>
 #include <optional>
 
 #include "engine/value_text.h"
@@ -30,12 +31,17 @@ void QuoteCsvValue(std::string_view text, std::string& out, bool quoteAll, char 
     if (quoteAll) out += "\"\"";
     return;
   }
-  bool wrap = quoteAll || text.find_first_of(std::string{csv::kQuote, separator, '\r', '\n'}) !=
-                              std::string_view::npos;
+  auto holds = [&text](char c) { return std::memchr(text.data(), c, text.size()) != nullptr; };
+  const bool quotes = holds(csv::kQuote);
+  const bool wrap = quoteAll || quotes || holds(separator) || holds('\r') || holds('\n');
   if (wrap) out.push_back(csv::kQuote);
-  for (char c : text) {
-    if (c == csv::kQuote) out.push_back(csv::kQuote);
-    out.push_back(c);
+  if (!quotes) {
+    out.append(text);
+  } else {
+    for (char c : text) {
+      if (c == csv::kQuote) out.push_back(csv::kQuote);
+      out.push_back(c);
+    }
   }
   if (wrap) out.push_back(csv::kQuote);
 }
@@ -69,8 +75,10 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
   const size_t count = db.recordCount();
   for (size_t index = 0; index < count; ++index) {
     if (view && !view->InView(index)) continue;
-    ui.Status(Printf("Reading and Writing Record %ld...", static_cast<long>(index)));
-    ui.Status(Printf("Reading Record: %ld:", static_cast<long>(index) - 30));
+    if (ui.WantsStatus()) {
+      ui.Status(Printf("Reading and Writing Record %ld...", static_cast<long>(index)));
+      ui.Status(Printf("Reading Record: %ld:", static_cast<long>(index) - 30));
+    }
     ByteView record = db.record(index);
     if (record.empty()) {
       ui.Status(Printf("ERROR:Reading Record: %ld", static_cast<long>(index)));
@@ -78,12 +86,13 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
       continue;
     }
     line.clear();
+    const auto fieldValues = FieldValues(record);
     for (int pos = 0; pos < format::kFieldCount; ++pos) {
       int slot = SlotAt(schema, pos, options.fieldNumberOrder);
       if (IsNotUsed(schema, slot)) continue;
       if (pos != 0) line.push_back(settings.separator);
       if (schema.field[slot].type() == FieldType::Image) continue;
-      std::string text = ValueText(values, record, slot);
+      std::string text = ValueTextOf(values, slot, fieldValues[slot]);
       if (text.size() > csv::kMaxValueText) text.resize(csv::kMaxValueText);
       QuoteCsvValue(text.empty() ? std::string_view("No Value") : std::string_view(text), line,
                     options.quoteAll, settings.separator);

@@ -86,11 +86,17 @@ void PutUnique(Database& db, Bytes& editing, int slot, const std::string& text) 
 
 }  // namespace
 
-bool ImportCsvRecord(Database& db, const CsvLine& line, int mode, const LocaleInfo& locale) {
+bool ImportCsvRecord(Database& db, const CsvLine& line, int mode, const LocaleInfo& locale,
+                     Bytes* scratch) {
   if (!db.CanAddRecord()) return false;
   const Schema& schema = db.schema();
   const ColumnMap columns = Columns(schema, mode);
-  Bytes editing = NewEditingRecord(schema);
+  // Every record writes the same bytes of the editing form (whole text
+  // slots, whole numbers), so one form can serve a whole import without
+  // being cleared: what one line leaves there the next overwrites.
+  Bytes local;
+  Bytes& editing = scratch ? *scratch : local;
+  if (editing.size() != EditingSize(schema)) editing = NewEditingRecord(schema);
   for (int slot = 0; slot < format::kFieldCount; ++slot) {
     const std::string& text = line.Field(static_cast<size_t>(columns[slot]));
     switch (schema.field[slot].type()) {
@@ -167,8 +173,9 @@ CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
     db.SetNextUniqueNumber(largest + 1);
   }
   in.Seek(0);
+  Bytes editing;
   while (ReadCsvLine(in, line, settings.separator)) {
-    if (!ImportCsvRecord(db, line, mode, locale)) break;
+    if (!ImportCsvRecord(db, line, mode, locale, &editing)) break;
     ++result.imported;
   }
   if (in.failed()) result.status = Status::Error("Cannot read " + path);

@@ -28,7 +28,10 @@ constexpr int kCsvColumnsBySlot = 1;          // column n: field slot n
 // database's next unique number; a number given is kept and the next
 // unique number moves past it. False (and nothing added) when the database
 // is full.
-bool ImportCsvRecord(Database& db, const CsvLine& line, int mode, const LocaleInfo& locale);
+// `scratch`, when given, is an editing record kept from one call to the
+// next of the same import (it saves building one per line).
+bool ImportCsvRecord(Database& db, const CsvLine& line, int mode, const LocaleInfo& locale,
+                     Bytes* scratch = nullptr);
 
 struct CsvImportResult {
   Status status;         // the first failure, if any

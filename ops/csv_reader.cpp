@@ -1,5 +1,6 @@
 #include "ops/csv_reader.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 
@@ -28,6 +29,9 @@ class FieldCollector {
   }
   void Add(char c) {
     if (line_) current_.push_back(c);
+  }
+  void Add(std::string_view run) {
+    if (line_) current_.append(run);
   }
   void Emit() {
     if (!line_) return;
@@ -60,6 +64,7 @@ uint64_t WalkLine(CsvStream& in, char separator, CsvLine* line) {
   FieldCollector out(line);
   State state = State::Between;
   for (;;) {
+    if (state != State::Between) out.Add(in.TakeOrdinary(sep, state == State::Quoted));
     int c = in.Get();
     if (state == State::Between) {
       if (c == kEnd) break;
@@ -154,6 +159,23 @@ int CsvStream::Get() {
   }
   canUnget_ = true;
   return static_cast<unsigned char>(buffer_[pos_++]);
+}
+
+std::string_view CsvStream::TakeOrdinary(int separator, bool quoted) {
+  if (separator != tableSeparator_) {
+    for (int q = 0; q < 2; ++q) {
+      bool* stop = stops_[q];
+      std::fill(stop, stop + 256, false);
+      stop[static_cast<unsigned char>(csv::kQuote)] = stop['\r'] = stop['\n'] = stop[0] = true;
+      if (q == 0 && separator >= 0 && separator < 256) stop[separator] = true;
+    }
+    tableSeparator_ = separator;
+  }
+  const bool* stop = stops_[quoted ? 1 : 0];
+  const size_t start = pos_;
+  while (pos_ < length_ && !stop[static_cast<unsigned char>(buffer_[pos_])]) ++pos_;
+  if (pos_ != start) canUnget_ = false;
+  return std::string_view(buffer_.data() + start, pos_ - start);
 }
 
 void CsvStream::Unget() {

@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <cstdio>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "ops/csv_format.h"
@@ -34,6 +35,11 @@ class CsvStream {
   // Gives back the byte the last Get() returned (not the end), once.
   void Unget();
   uint64_t Tell() const { return bufferStart_ + pos_; }
+  // Takes the bytes that follow in the buffer as long as they are ordinary
+  // characters of a field: not a double quote, CR, LF or zero byte, and
+  // (outside quotes) not the separator. Lets the reader move through long
+  // values without a call per byte; what it takes is never given back.
+  std::string_view TakeOrdinary(int separator, bool quoted);
   void Seek(uint64_t position);
   // True when reading the file failed (as opposed to reaching its end).
   bool failed() const { return failed_; }
@@ -48,6 +54,10 @@ class CsvStream {
   size_t length_ = 0;
   bool canUnget_ = false;
   bool failed_ = false;
+  // Which bytes end an ordinary run, for the separator last asked about
+  // (outside quotes, inside quotes).
+  int tableSeparator_ = -1;
+  bool stops_[2][256] = {};
 };
 
 // One parsed line: the field texts (never fewer than 30; the missing

@@ -37,8 +37,10 @@ class UiPort {
                                                  const std::string& suggested) = 0;
 
   // Wait-cursor and status hook for long operations; default does nothing.
+  // Callers skip formatting status texts nobody shows.
   virtual void SetBusy(bool /*busy*/) {}
   virtual void Status(const std::string& /*text*/) {}
+  virtual bool WantsStatus() const { return false; }
 };
 
 // A port that says nothing and answers every question "No" / cancel. Useful

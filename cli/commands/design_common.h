@@ -24,11 +24,8 @@ inline std::optional<bool> ParseSwitch(const std::string& text) {
   return std::nullopt;
 }
 
-// After the work: a question left unanswered means nothing may be saved.
-inline bool QuestionsAnswered(Context& ctx) {
-  if (!ctx.ui.unanswered()) return true;
-  ctx.err << "Nothing was changed.\n";
-  return false;
-}
+// After the work: a question left unanswered means nothing may be saved
+// (the port has already said so when it refused the question).
+inline bool QuestionsAnswered(Context& ctx) { return !ctx.ui.unanswered(); }
 
 }  // namespace cx::cli

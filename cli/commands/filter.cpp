@@ -90,8 +90,10 @@ class FilterCommand : public Command {
       values.orBetween = args.has("--or");
       AcceptFilterDialog(db, values);
     }
-    if ((setting || args.has("--off")) && !SaveForCommand(ctx, db)) return kExitFailed;
-    session.view = RebuildView(db, session.Link());
+    const bool changed = setting || args.has("--off");
+    if (changed && !SaveForCommand(ctx, db)) return kExitFailed;
+    // The open built the view already; only new filters need it again.
+    if (changed) session.view = RebuildView(db, session.Link());
     Show(ctx, db, OpenFilterDialog(db), session.view.size());
     return kExitOk;
   }

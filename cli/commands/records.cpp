@@ -6,7 +6,7 @@
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/record_output.h"
-#include "ops/view.h"
+#include "ops/session.h"
 
 namespace cx::cli {
 namespace {
@@ -31,14 +31,15 @@ class RecordsCommand : public Command {
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    DataSession session(db, ctx.locale, ctx.ui);
+    if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
 
     std::vector<size_t> rows;
     if (args.has("--all")) {
       rows.resize(db.recordCount());
       for (size_t i = 0; i < rows.size(); ++i) rows[i] = i;
     } else {
-      for (uint32_t i : RebuildView(db)) rows.push_back(i);
+      rows.assign(session.view.begin(), session.view.end());
     }
     WriteRecords(ctx, db, rows);
     return kExitOk;

@@ -32,10 +32,12 @@ class StringSink : public TextSink {
 };
 
 // Bytes into a new version of a file that replaces the old one only when
-// Commit() succeeds (nothing is left behind otherwise).
+// Commit() succeeds (nothing is left behind otherwise). Not flushed to disk:
+// an export can always be made again, and waiting for the disk would make
+// every export of a large database pay for it.
 class FileSink : public TextSink {
  public:
-  explicit FileSink(const std::string& path) : writer_(path) {}
+  explicit FileSink(const std::string& path) : writer_(path, /*sync=*/false) {}
   Status Open() { return writer_.Open(); }
   bool Write(std::string_view bytes) override { return writer_.Write(bytes.data(), bytes.size()); }
   Status Commit() { return writer_.Commit(); }

@@ -144,7 +144,8 @@ bool MakeDirectories(const std::string& dir) {
   return ::mkdir(dir.c_str(), 0777) == 0 || errno == EEXIST;
 }
 
-SafeFileWriter::SafeFileWriter(std::string target) : target_(std::move(target)) {}
+SafeFileWriter::SafeFileWriter(std::string target, bool sync)
+    : target_(std::move(target)), sync_(sync) {}
 
 SafeFileWriter::~SafeFileWriter() { Abandon(); }
 
@@ -203,7 +204,7 @@ bool SafeFileWriter::Write(const void* data, size_t size) {
 Status SafeFileWriter::Commit() {
   if (fd_ < 0) return Status::Error("Cannot write " + target_ + (error_.empty() ? "" : ": " + error_));
   if (!failed_) Flush();
-  if (!failed_ && ::fsync(fd_) != 0) {
+  if (!failed_ && sync_ && ::fsync(fd_) != 0) {
     failed_ = true;
     error_ = ErrnoText();
   }
@@ -225,6 +226,7 @@ Status SafeFileWriter::Commit() {
     return Status::Error("Cannot write " + target_ + ": " + error_);
   }
   temp_.clear();
+  if (!sync_) return Status::Ok();
   // Make the rename itself durable.
   int dfd = ::open(DirectoryOf(target_).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
   if (dfd >= 0) {

@@ -49,7 +49,10 @@ bool MakeDirectories(const std::string& dir);
 // untouched; destroying an uncommitted writer removes the temporary file.
 class SafeFileWriter {
  public:
-  explicit SafeFileWriter(std::string target);
+  // `sync` false leaves out the flushes to disk: the old file is still
+  // replaced only by a complete new one, but a power failure right after
+  // may lose the new one. For text exports, which can be made again.
+  explicit SafeFileWriter(std::string target, bool sync = true);
   ~SafeFileWriter();
   SafeFileWriter(const SafeFileWriter&) = delete;
   SafeFileWriter& operator=(const SafeFileWriter&) = delete;
@@ -68,6 +71,7 @@ class SafeFileWriter {
   std::string target_;
   std::string temp_;
   int fd_ = -1;
+  bool sync_ = true;
   bool failed_ = false;
   std::string error_;
   std::vector<uint8_t> buffer_;

@@ -2,8 +2,10 @@
 // with its messages, the pending work a file asks for, and the save.
 #pragma once
 
+#include <optional>
 #include <string>
 
+#include "cli/args.h"
 #include "cli/command.h"
 #include "engine/record_store.h"
 #include "ops/session.h"
@@ -21,6 +23,11 @@ bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session)
 
 // Saves `db` (to `path` when given); false after printing the message.
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");
+
+// "--record N": `record` stays empty without the option and is N when N
+// names a record of `db`; false (with `error` set) for anything else.
+bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& record,
+                  std::string& error);
 
 // A field given as a slot number (0-29) or a field name; -1 when neither.
 int ResolveField(const Database& db, const std::string& text);

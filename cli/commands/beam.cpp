@@ -39,15 +39,11 @@ class BeamCommand : public Command {
     if (!Allowed(CheckAccess(db, secured::kBeamData, ctx.ui))) return kExitFailed;
 
     obex::BeamWhat what = obex::BeamWhat::kDatabase;
-    size_t record = 0;
-    if (auto r = args.value("--record")) {
-      auto n = ParseNumber(*r);
-      if (!n || *n < 0 || static_cast<size_t>(*n) >= db.recordCount()) {
-        return UsageError(ctx, *this, "--record takes a record index below " +
-                                          std::to_string(db.recordCount()));
-      }
+    std::optional<size_t> one;
+    if (std::string error; !RecordOption(args, db, one, error)) return UsageError(ctx, *this, error);
+    const size_t record = one.value_or(0);
+    if (one) {
       what = obex::BeamWhat::kRecord;
-      record = static_cast<size_t>(*n);
     } else if (args.has("--records")) {
       what = obex::BeamWhat::kRecordsInView;
     }

@@ -32,17 +32,10 @@ class PrintCommand : public Command {
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
-    bool all = true;
-    size_t current = 0;
-    if (auto r = args.value("--record")) {
-      auto n = ParseNumber(*r);
-      if (!n || *n < 0 || static_cast<size_t>(*n) >= db.recordCount()) {
-        return UsageError(ctx, *this, "--record takes a record index below " +
-                                          std::to_string(db.recordCount()));
-      }
-      all = false;
-      current = static_cast<size_t>(*n);
-    }
+    std::optional<size_t> record;
+    if (std::string error; !RecordOption(args, db, record, error)) return UsageError(ctx, *this, error);
+    const bool all = !record;
+    const size_t current = record.value_or(0);
     PrintSettings settings;
     if (auto c = args.value("--command")) settings.command = *c;
     settings.arguments = args.values("--arg");

@@ -166,7 +166,7 @@ std::string_view CsvStream::TakeOrdinary(int separator, bool quoted) {
     for (int q = 0; q < 2; ++q) {
       bool* stop = stops_[q];
       std::fill(stop, stop + 256, false);
-      stop[static_cast<unsigned char>(csv::kQuote)] = stop['\r'] = stop['\n'] = stop[0] = true;
+      stop[static_cast<unsigned char>(csv::kQuote)] = stop[int{'\r'}] = stop[int{'\n'}] = stop[0] = true;
       if (q == 0 && separator >= 0 && separator < 256) stop[separator] = true;
     }
     tableSeparator_ = separator;

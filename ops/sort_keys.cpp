@@ -35,7 +35,7 @@ class TextRanks {
     auto view = [&](const Entry& e) { return std::string_view(buffer_.data() + e.offset, e.length); };
     auto less = [&](const Entry& a, const Entry& b) {
       if (a.prefix != b.prefix) return a.prefix < b.prefix;
-      return a.length > 8 && b.length > 8 && view(a) < view(b);
+      return (a.length > 8 || b.length > 8) && view(a) < view(b);
     };
     std::sort(at_.begin(), at_.end(), less);
     int64_t rank = 0;

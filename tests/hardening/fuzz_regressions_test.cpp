@@ -12,7 +12,11 @@
 #include <string>
 #include <vector>
 
+#include "engine/record.h"
+#include "engine/record_store.h"
 #include "fuzz/targets.h"
+#include "ops/compare.h"
+#include "ops/sort.h"
 
 namespace cx::fuzz {
 namespace {
@@ -53,6 +57,28 @@ TEST_P(FuzzReplay, CorpusAndRegressionsPass) {
 
 INSTANTIATE_TEST_SUITE_P(Targets, FuzzReplay, ::testing::ValuesIn(kTargets),
                          [](const auto& info) { return std::string(info.param.name); });
+
+// The findings again, as plain tests of what went wrong.
+
+// Sorting ranked texts by their first eight characters and only looked
+// further when both were longer, so "Anderson" and "Andersons" tied.
+TEST(FuzzFindings, TextsSharingTheirFirstEightCharactersSort) {
+  for (uint8_t direction : {1, 0}) {
+    Database db = Database::CreateNew("unused.PDB", "Sort");
+    Schema& s = db.schema();
+    s.field[0].typeNumber = static_cast<int16_t>(FieldType::Text);
+    s.sortKey[0] = {0, direction};
+    for (const char* name : {"Andersons", "anderson", "Andersen", "ANDERSONS2", "Anderso"}) {
+      Bytes e = NewEditingRecord(s);
+      SetEditingText(e, 0, name, s);
+      db.AppendRecord(Compact(e, s));
+    }
+    SortAll(db);
+    for (size_t i = 1; i < db.recordCount(); ++i) {
+      EXPECT_LT(CompareRecords(db, db.record(i - 1), db.record(i)), 0) << "direction " << int(direction);
+    }
+  }
+}
 
 }  // namespace
 }  // namespace cx::fuzz

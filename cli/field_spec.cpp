@@ -74,7 +74,7 @@ int FormatIndex(std::string f) {
 
 }  // namespace
 
-bool ParseFieldSpec(const std::string& text, FieldSpec& spec, std::string& error) {
+bool ParseFieldSpec(const std::string& text, FieldSpec& plan, std::string& error) {
   std::string cp = Utf8ToCp1252(text);
   size_t c1 = cp.find(':');
   if (c1 == std::string::npos || c1 == 0) {
@@ -94,7 +94,7 @@ bool ParseFieldSpec(const std::string& text, FieldSpec& spec, std::string& error
     error = "a field name has at most 19 characters";
     return false;
   }
-  FieldDef& d = spec.def;
+  FieldDef& d = plan.def;
   d = FieldDef();
   d.name.set(name);
   d.typeNumber = static_cast<int16_t>(*type);
@@ -124,8 +124,8 @@ bool ParseFieldSpec(const std::string& text, FieldSpec& spec, std::string& error
     } else if (key == "noexport") {
       d.exportPrint = 0;
     } else if (key == "items") {
-      spec.popupItems = Split(value, '|');
-      if (spec.popupItems.size() > 60) {
+      plan.popupItems = Split(value, '|');
+      if (plan.popupItems.size() > 60) {
         error = "a popup list holds at most 60 items";
         return false;
       }
@@ -173,7 +173,7 @@ bool ParseFieldSpec(const std::string& text, FieldSpec& spec, std::string& error
           d.SetConstant2(value.substr(1));
         }
       } else {
-        (first ? spec.operand1Field : spec.operand2Field) = value;
+        (first ? plan.operand1Field : plan.operand2Field) = value;
       }
     } else if (key == "prev1") {
       d.calcFlags |= 1;
@@ -194,7 +194,7 @@ bool ParseFieldSpec(const std::string& text, FieldSpec& spec, std::string& error
   return true;
 }
 
-bool ResolveOperands(FieldSpec& spec, const Schema& schema, std::string& error) {
+bool ResolveOperands(FieldSpec& plan, const Schema& schema, std::string& error) {
   auto resolve = [&](const std::string& text, uint8_t& param) {
     if (text.empty()) return true;
     if (auto n = ParseNumber(text); n && *n >= 0 && *n < format::kFieldCount) {
@@ -210,7 +210,7 @@ bool ResolveOperands(FieldSpec& spec, const Schema& schema, std::string& error) 
     error = "no field named '" + Cp1252ToUtf8(text) + "'";
     return false;
   };
-  return resolve(spec.operand1Field, spec.def.param1) && resolve(spec.operand2Field, spec.def.param2);
+  return resolve(plan.operand1Field, plan.def.param1) && resolve(plan.operand2Field, plan.def.param2);
 }
 
 }  // namespace cx::cli

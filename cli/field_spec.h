@@ -21,11 +21,11 @@ struct FieldSpec {
   std::string operand1Field, operand2Field;
 };
 
-// Parses one specification; on failure `error` says why.
-bool ParseFieldSpec(const std::string& text, FieldSpec& spec, std::string& error);
+// Parses one field description; on failure `error` says why.
+bool ParseFieldSpec(const std::string& text, FieldSpec& plan, std::string& error);
 
 // Resolves calculated operands named by field against `schema`.
-bool ResolveOperands(FieldSpec& spec, const Schema& schema, std::string& error);
+bool ResolveOperands(FieldSpec& plan, const Schema& schema, std::string& error);
 
 // The option list, for --help.
 extern const char* const kFieldSpecHelp;

@@ -126,9 +126,9 @@ std::string DecimalText(double value, int places, const LocaleInfo& locale) {
   if (r.ec == std::errc()) {
     out.assign(buf, r.ptr);
   } else {
-    char spec[16];
-    std::snprintf(spec, sizeof spec, "%%.%df", places);
-    std::snprintf(buf, sizeof buf, spec, value);
+    char pattern[16];
+    std::snprintf(pattern, sizeof pattern, "%%.%df", places);
+    std::snprintf(buf, sizeof buf, pattern, value);
     out = buf;
   }
   if (locale.decimalSeparator != '.') {

@@ -1,6 +1,6 @@
 # Builds one sample database from its readable sources:
 #   cmake -DCLI=... -DSRC=<dir> -DOUT=<dir> -DNAME=<Name> -P make_sample.cmake
-# NAME.fields holds the field specifications, NAME.csv the records (UTF-8;
+# NAME.fields holds the field descriptions, NAME.csv the records (UTF-8;
 # converted to the files' Windows-1252 here).
 cmake_minimum_required(VERSION 3.25)
 

@@ -29,7 +29,7 @@ class FilterCommand : public Command {
   std::string summary() const override { return "show or set the two filters"; }
   std::string help() const override {
     return "Usage: cardovex-cli [--json] filter FILE\n"
-           "       cardovex-cli filter FILE [--filter1 SPEC] [--filter2 SPEC] [--not1] [--not2]\n"
+           "       cardovex-cli filter FILE [--filter1 COND] [--filter2 COND] [--not1] [--not2]\n"
            "                    [--or]\n"
            "       cardovex-cli filter FILE --off\n"
            "Without options: shows both filters and how many records are in view.\n"
@@ -37,11 +37,11 @@ class FilterCommand : public Command {
            "and shows the result. The command line is the whole dialog: a filter not\n"
            "named is switched off (its settings are kept), NOT and OR are off unless\n"
            "given.\n"
-           "  --filter1 SPEC, --filter2 SPEC   switch the filter on with SPEC\n"
+           "  --filter1 COND, --filter2 COND   switch the filter on with COND\n"
            "  --not1, --not2   the filter's \"NOT\" (needs its --filterN)\n"
            "  --or             combine the filters with OR (otherwise AND)\n"
            "  --off            switch both filters off, changing nothing else\n"
-           "SPEC is FIELD=VALUE, FIELD a slot number (0-29) or a field name, VALUE by\n"
+           "COND is FIELD=VALUE, FIELD a slot number (0-29) or a field name, VALUE by\n"
            "the field's type:\n"
            "  Text, Note, DB Popup, Linked   the \"Must Contain\" text, case ignored\n"
            "                                 (empty: only records whose value is empty)\n"
@@ -83,7 +83,7 @@ class FilterCommand : public Command {
         f.notChecked = args.has("--not" + k);
         if (!f.enabled) continue;
         std::string error;
-        if (!ReadSpec(ctx, db, *args.value("--filter" + k), f, error)) {
+        if (!ReadCondition(ctx, db, *args.value("--filter" + k), f, error)) {
           return UsageError(ctx, *this, "--filter" + k + ": " + error);
         }
       }
@@ -101,18 +101,18 @@ class FilterCommand : public Command {
  private:
   // FIELD=VALUE; a field name may itself hold "=", so each "=" is tried
   // until the text before it names a field.
-  static bool ReadSpec(const Context& ctx, const Database& db, const std::string& spec, FilterDialogFilter& f,
+  static bool ReadCondition(const Context& ctx, const Database& db, const std::string& cond, FilterDialogFilter& f,
                        std::string& error) {
-    for (size_t eq = spec.find('='); eq != std::string::npos; eq = spec.find('=', eq + 1)) {
-      const int field = ResolveField(db, spec.substr(0, eq));
+    for (size_t eq = cond.find('='); eq != std::string::npos; eq = cond.find('=', eq + 1)) {
+      const int field = ResolveField(db, cond.substr(0, eq));
       if (field < 0) continue;
-      const std::string value = Utf8ToCp1252(spec.substr(eq + 1));
+      const std::string value = Utf8ToCp1252(cond.substr(eq + 1));
       if (ReadFilterValueText(db, field, value, ctx.locale, f, error)) return true;
       error = Cp1252ToUtf8(error);
       return false;
     }
-    error = spec.find('=') == std::string::npos ? "SPEC is FIELD=VALUE"
-                                                : "no field " + spec.substr(0, spec.find('='));
+    error = cond.find('=') == std::string::npos ? "COND is FIELD=VALUE"
+                                                : "no field " + cond.substr(0, cond.find('='));
     return false;
   }
 

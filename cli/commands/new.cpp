@@ -17,11 +17,11 @@ class NewCommand : public Command {
   std::string summary() const override { return "create a new database with the fields given"; }
   std::string help() const override {
     return std::string(
-               "Usage: cardovex-cli new FILE --name NAME --field SPEC [--field SPEC ...]\n"
+               "Usage: cardovex-cli new FILE --name NAME --field DEF [--field DEF ...]\n"
                "                        [--extension] [--force]\n"
                "Creates a database whose fields take slots 0, 1, ... in the order given.\n"
                "  --name NAME    the database name (at most 19 characters)\n"
-               "  --field SPEC   NAME:TYPE[:option=value,...]; TYPE is a type label: Text,\n"
+               "  --field DEF   NAME:TYPE[:option=value,...]; TYPE is a type label: Text,\n"
                "                 Integer, Float, Pop-Up, Check-Box, Unique, Image, Date, Time,\n"
                "                 Link, Linked, Note, Heading, DB Popup, Calculated\n"
                "  --extension    records carry the 20-byte prefix extension\n"
@@ -47,19 +47,19 @@ class NewCommand : public Command {
     Database db = Database::CreateNew(path, name);
     Schema& schema = db.schema();
     if (args.has("--extension")) schema.recordExtension = 1;
-    std::vector<FieldSpec> specs;
+    std::vector<FieldSpec> plans;
     for (const std::string& text : args.values("--field")) {
-      FieldSpec spec;
+      FieldSpec plan;
       std::string error;
-      if (!ParseFieldSpec(text, spec, error)) return UsageError(ctx, *this, error);
-      specs.push_back(std::move(spec));
+      if (!ParseFieldSpec(text, plan, error)) return UsageError(ctx, *this, error);
+      plans.push_back(std::move(plan));
     }
-    for (size_t slot = 0; slot < specs.size(); ++slot) schema.field[slot] = specs[slot].def;
-    for (size_t slot = 0; slot < specs.size(); ++slot) {
+    for (size_t slot = 0; slot < plans.size(); ++slot) schema.field[slot] = plans[slot].def;
+    for (size_t slot = 0; slot < plans.size(); ++slot) {
       std::string error;
-      if (!ResolveOperands(specs[slot], schema, error)) return UsageError(ctx, *this, error);
-      schema.field[slot] = specs[slot].def;
-      db.popups()[slot].items = specs[slot].popupItems;
+      if (!ResolveOperands(plans[slot], schema, error)) return UsageError(ctx, *this, error);
+      schema.field[slot] = plans[slot].def;
+      db.popups()[slot].items = plans[slot].popupItems;
     }
     return SaveForCommand(ctx, db) ? kExitOk : kExitFailed;
   }

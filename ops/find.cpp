@@ -111,7 +111,9 @@ int FindRecord(const Database& db, const SearchSettings& search, int startIndex,
     if (report) ShowErrorBox(*report, kNotFound);
     return -1;
   };
-  if (start >= count) return notFound();
+  // A start at the last record counts as past the end: the search starts
+  // only from a record that has another one after it.
+  if (start >= count - 1) return notFound();
 
   ViewTester tester(db, link);
   for (long i = start; i < count; ++i) {

@@ -35,7 +35,9 @@ class FindCommand : public Command {
            "field as the list shows it. Integer and Unique fields match only a TEXT of\n"
            "digits; a Check-Box matches \"1\" when checked and \"0\" when not.\n"
            "Each repeat starts at field 0 of the record after the last hit, so a\n"
-           "record is reported once, with its first matching field.\n"
+           "record is reported once, with its first matching field. A search never\n"
+           "starts at the last record: when the previous hit was the record before\n"
+           "it, the last record is not searched.\n"
            "Output: one \"INDEX<TAB>SLOT<TAB>FIELD NAME\" line per hit; with --json\n"
            "[{\"index\": N, \"slot\": S}, ...]. The search ends with \"Not Found in\n"
            "Database!\" on stderr. Exit status 0 when there was a hit, 1 when none.\n";

@@ -110,14 +110,23 @@ void CheckViewAndFind(Database& db, std::mt19937& rng) {
   session.view = expected;
   SearchSettings search;
   search.text = std::string(1, static_cast<char>('a' + rng() % 26)) + static_cast<char>('a' + rng() % 26);
-  std::vector<int> wanted;
+  std::vector<int> matching;
   for (uint32_t i : expected) {
     for (int field = 0; field < format::kFieldCount; ++field) {
       if (FieldMatches(db, db.record(i), field, search.text, false, false, locale)) {
-        wanted.push_back(static_cast<int>(i));
+        matching.push_back(static_cast<int>(i));
         break;
       }
     }
+  }
+  // Each search starts after the previous hit, and a start at the last
+  // record finds nothing.
+  std::vector<int> wanted;
+  const int last = static_cast<int>(db.recordCount()) - 1;
+  for (int start = 0, k = 0; start < last && k < static_cast<int>(matching.size()); ++k) {
+    if (matching[k] < start) continue;
+    wanted.push_back(matching[k]);
+    start = matching[k] + 1;
   }
   std::vector<int> hits;
   for (int hit = SearchDatabase(session, search); hit >= 0 && hits.size() <= db.recordCount();

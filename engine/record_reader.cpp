@@ -36,7 +36,9 @@ bool RecordReader::Next(std::span<const uint8_t>& bytes, uint8_t& attributes, ui
     uint32_t end = entries_[next_].offset;
     if (end < e.offset || end > fileSize) return false;
     size = end - e.offset;
-    if (size >= format::kMaxRecordSize) return false;
+    // As large as the last record may be, so that a record moved by a sort
+    // from the end of a file is read back from the middle of the next one.
+    if (size > format::kMaxRecordSize) return false;
   } else {
     size = fileSize - e.offset;
     if (size > format::kMaxRecordSize) {

@@ -28,7 +28,7 @@ class RecordReader {
   // runs to the next entry's offset; the last one to the end of the file,
   // cut to 65535 bytes. False when the entries are used up or the record
   // cannot be read (offset past the end of the file, offsets out of order,
-  // a record of 65535 bytes or more).
+  // a record of more than 65535 bytes).
   bool Next(std::span<const uint8_t>& bytes, uint8_t& attributes, uint32_t& uniqueID);
 
   size_t index() const { return next_; }

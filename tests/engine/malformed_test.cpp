@@ -141,9 +141,9 @@ TEST_F(MalformedFileTest, DataRecordPastTheEndOfTheFile) {
   ExpectPartial(OpenBytes(f), 1);
 }
 
-TEST_F(MalformedFileTest, DataRecordOf65535BytesBeforeTheLast) {
+TEST_F(MalformedFileTest, DataRecordOver65535BytesBeforeTheLast) {
   ByteVector huge = SlotWriter().Text("r0").End().bytes;
-  huge.resize(65535, 'h');
+  huge.resize(65536, 'h');
   ExpectPartial(OpenBytes(FileWith({huge, SlotWriter().Text("r1").End().bytes})), 0);
 }
 

@@ -295,11 +295,11 @@ TEST_F(LimitsTest, CountsTheFileCannotBack) {
     EXPECT_LT(partial.growthKb, 8192);
   }
 
-  // A record of 65535 bytes is more than a record may hold: the records
+  // A record over 65535 bytes is more than a record may hold: the records
   // before it are read, and saving over the file is refused.
   Database big = Database::CreateNew(path, "Big");
   big.AppendRecord(Bytes{0, 0xFF, 0xFF});
-  big.AppendRecord(Bytes(format::kMaxRecordSize, 0));
+  big.AppendRecord(Bytes(format::kMaxRecordSize + 1, 0));
   big.AppendRecord(Bytes{0, 0xFF, 0xFF});
   ASSERT_TRUE(big.SaveAs(path, kClock).ok());
   SilentUi ui;

@@ -1,10 +1,13 @@
 #include "fuzz/scratch.h"
 
 #include <fcntl.h>
+#include <signal.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstdlib>
+#include <cstring>
 #include <filesystem>
 
 #include "fuzz/fuzz_check.h"
@@ -21,7 +24,8 @@ class ScratchFolder {
       const char* tmp = std::getenv("TMPDIR");
       base = tmp && *tmp ? tmp : "/tmp";
     }
-    path_ = base + "/cardovex-fuzz-" + std::to_string(::getpid());
+    RemoveStale(base);
+    path_ = base + "/" + kPrefix + std::to_string(::getpid());
     std::filesystem::create_directories(path_);
   }
   ~ScratchFolder() {
@@ -31,6 +35,22 @@ class ScratchFolder {
   const std::string& path() const { return path_; }
 
  private:
+  static constexpr const char* kPrefix = "cardovex-fuzz-";
+
+  // libFuzzer ends a run without running destructors, so each process
+  // clears the folders of processes that are gone.
+  static void RemoveStale(const std::string& base) {
+    std::error_code ec;
+    for (const auto& e : std::filesystem::directory_iterator(base, ec)) {
+      const std::string name = e.path().filename().string();
+      if (name.rfind(kPrefix, 0) != 0) continue;
+      const long pid = std::strtol(name.c_str() + std::strlen(kPrefix), nullptr, 10);
+      if (pid > 0 && ::kill(static_cast<pid_t>(pid), 0) != 0 && errno == ESRCH) {
+        std::filesystem::remove_all(e.path(), ec);
+      }
+    }
+  }
+
   std::string path_;
 };
 

@@ -2,6 +2,7 @@
 
 #include <cctype>
 
+#include "engine/field_types.h"
 #include "engine/record_reader.h"
 
 namespace cx {
@@ -13,18 +14,6 @@ constexpr std::array<std::string_view, secured::kCount> kOperationLabels = {
 
 constexpr std::array<std::string_view, access_level::kCount> kLevelLabels = {
     "Full Access", "Password Required", "No Access", "View Records Only"};
-
-// Lower-case letters and digits only, so that "Edit Records", "edit-records"
-// and "editrecords" all compare equal.
-std::string Squeeze(std::string_view s) {
-  std::string out;
-  for (char c : s) {
-    if (std::isalnum(static_cast<unsigned char>(c))) {
-      out.push_back(static_cast<char>(std::tolower(static_cast<unsigned char>(c))));
-    }
-  }
-  return out;
-}
 
 }  // namespace
 
@@ -39,17 +28,17 @@ std::string_view AccessLevelLabel(int level) {
 int LevelsOffered(int op) { return op == secured::kEditRecords ? 4 : 3; }
 
 int OperationFromName(std::string_view name) {
-  const std::string key = Squeeze(name);
+  const std::string key = SimplifiedLabel(name);
   for (int op = 0; op < secured::kCount; ++op) {
-    if (Squeeze(kOperationLabels[op]) == key) return op;
+    if (SimplifiedLabel(kOperationLabels[op]) == key) return op;
   }
   return -1;
 }
 
 int AccessLevelFromName(std::string_view name) {
-  const std::string key = Squeeze(name);
+  const std::string key = SimplifiedLabel(name);
   for (int level = 0; level < access_level::kCount; ++level) {
-    if (Squeeze(kLevelLabels[level]) == key) return level;
+    if (SimplifiedLabel(kLevelLabels[level]) == key) return level;
   }
   if (key == "full") return access_level::kFull;
   if (key == "password") return access_level::kPassword;

@@ -47,8 +47,8 @@ void EncodeHeader(const Header& header, uint8_t* out);  // writes 78 bytes
 RecordEntry DecodeEntry(const uint8_t* bytes);
 void EncodeEntry(const RecordEntry& entry, uint8_t* out);  // writes 8 bytes
 
-// Reads the header of a file: 0 when the file cannot be opened (or is too
-// short to hold a header), 1 when the creator is ours, -1 otherwise. The
+// Reads the header of a file: 0 when the file cannot be opened, 1 when the
+// creator is ours, -1 otherwise (a file too short to hold a header too). The
 // header is filled in whenever 78 bytes could be read.
 int ReadHeader(const std::string& path, Header& header);
 

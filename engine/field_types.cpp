@@ -10,7 +10,9 @@ constexpr std::array<std::string_view, kFieldTypeCount> kLabels = {
     "Not-Used", "Text",  "Integer", "Float", "Pop-Up", "Check-Box", "Unique",  "Image",
     "Date",     "Time",  "Link",    "Linked", "Note",  "Heading",   "DB Popup", "Calculated"};
 
-std::string Simplify(std::string_view s) {
+}  // namespace
+
+std::string SimplifiedLabel(std::string_view s) {
   std::string out;
   for (char c : s) {
     if (std::isalnum(static_cast<unsigned char>(c))) {
@@ -20,17 +22,15 @@ std::string Simplify(std::string_view s) {
   return out;
 }
 
-}  // namespace
-
 std::string_view FieldTypeLabel(FieldType type) {
   auto n = static_cast<int>(type);
   return n >= 0 && n < kFieldTypeCount ? kLabels[n] : kLabels[0];
 }
 
 std::optional<FieldType> FieldTypeFromLabel(std::string_view label) {
-  std::string wanted = Simplify(label);
+  std::string wanted = SimplifiedLabel(label);
   for (int i = 0; i < kFieldTypeCount; ++i) {
-    if (Simplify(kLabels[i]) == wanted) return static_cast<FieldType>(i);
+    if (SimplifiedLabel(kLabels[i]) == wanted) return static_cast<FieldType>(i);
   }
   return std::nullopt;
 }

@@ -41,6 +41,11 @@ std::string_view FieldTypeLabel(FieldType type);
 // punctuation ("popup", "checkbox", "dbpopup", "notused").
 std::optional<FieldType> FieldTypeFromLabel(std::string_view label);
 
+// Letters and digits of `label`, lower-cased: "Edit Records",
+// "edit-records" and "editrecords" all give "editrecords". Used to accept
+// labels typed in scripts.
+std::string SimplifiedLabel(std::string_view label);
+
 // Calculated fields: byte 33 of the field's text slot.
 enum class ResultFormat : uint8_t {
   FourPlaces = 0,

@@ -1,0 +1,164 @@
+#include "app/record_commit.h"
+
+#include "design/security.h"
+#include "ops/calc.h"
+#include "ops/field_values.h"
+#include "ops/links.h"
+#include "ops/sort.h"
+#include "ops/view.h"
+
+namespace cx {
+namespace {
+
+// True when some Calculated field reads `field` (from this record or the
+// previous one).
+bool FeedsCalculation(const Schema& schema, int field) {
+  for (int f = 0; f < format::kFieldCount; ++f) {
+    if (!IsCalculated(schema, f)) continue;
+    if (CalcOperand1(schema.field[f]).field == field || CalcOperand2(schema.field[f]).field == field) {
+      return true;
+    }
+  }
+  return false;
+}
+
+// A full pass may sort the table again (a Calculated sort key): follow the
+// record to wherever it went.
+size_t Relocate(const Database& db, const Bytes& expected, size_t index) {
+  if (index < db.recordCount()) {
+    ByteView now = db.record(index);
+    if (std::equal(now.begin(), now.end(), expected.begin(), expected.end())) return index;
+  }
+  const long found = FindRecord(db, expected, index);
+  return found >= 0 ? static_cast<size_t>(found) : index;
+}
+
+void Finish(DataSession& session) {
+  session.calc.fieldChanged.fill(0);
+  session.view = RebuildView(session.db, session.Link());
+  session.db.MarkChanged();
+}
+
+}  // namespace
+
+StoreOutcome StoreRecord(DataSession& session, size_t index, Bytes stored,
+                         const std::array<bool, format::kFieldCount>& changed, bool inPlace,
+                         RecordHistory* history) {
+  Database& db = session.db;
+  StoreOutcome out;
+  RecordStep step;
+  const bool adding = index == kNewRecordIndex;
+  if (adding) {
+    if (!db.CanAddRecord() || stored.size() > format::kMaxRecordSize) {
+      session.ui.ShowMessage(record_messages::kSavingError, "ERROR", MessageIcon::Error);
+      return out;
+    }
+    step.kind = RecordStep::Kind::Add;
+    index = db.recordCount();
+    db.AppendRecord(std::move(stored));
+  } else {
+    if (index >= db.recordCount() || stored.size() > format::kMaxRecordSize) {
+      session.ui.ShowMessage(record_messages::kSavingError, "ERROR", MessageIcon::Error);
+      return out;
+    }
+    step.kind = RecordStep::Kind::Change;
+    ByteView before = db.record(index);
+    step.before.assign(before.begin(), before.end());
+    step.beforeIndex = index;
+    db.ReplaceRecord(index, std::move(stored));
+  }
+
+  for (int f = 0; f < format::kFieldCount; ++f) {
+    if (changed[f]) session.calc.fieldChanged[f] = 1;
+  }
+  if (HasCalculatedField(db.schema())) RecalculateRecord(session, index);
+  const size_t oldIndex = index;
+  if (!inPlace) index = RepositionRecord(db, index);
+  ByteView placed = db.record(index);
+  Bytes expected(placed.begin(), placed.end());
+  RecalculateAfterMove(session, adding ? oldIndex : step.beforeIndex, index);
+  index = Relocate(db, expected, index);
+  Finish(session);
+
+  if (history) {
+    ByteView after = db.record(index);
+    step.after.assign(after.begin(), after.end());
+    step.afterIndex = index;
+    step.inPlace = inPlace;
+    history->Push(std::move(step));
+  }
+  out.ok = out.stored = true;
+  out.index = index;
+  return out;
+}
+
+StoreOutcome CommitForm(RecordForm& form, RecordHistory* history) {
+  if (!form.isNew() && !form.AnyModified()) {
+    StoreOutcome unchanged;
+    unchanged.ok = true;
+    unchanged.index = form.index();
+    return unchanged;
+  }
+  form.PrepareForSave();
+  return StoreRecord(form.session(), form.index(), form.Stored(), form.ModifiedFields(), false,
+                     history);
+}
+
+int InPlaceEdit(DataSession& session, size_t index, int field,
+                const std::function<void(RecordForm&)>& change, const Clock& clock,
+                RecordHistory* history) {
+  if (index >= session.db.recordCount() || field < 0 || field >= format::kFieldCount) return -1;
+  RecordForm form(session, index, clock);
+  change(form);
+  if (!form.Modified(field)) return 0;
+  std::array<bool, format::kFieldCount> changed{};
+  changed[field] = true;
+  Bytes stored = SpliceRecord(session.db.record(index), form.editing(), session.db.schema(), changed);
+  if (!FeedsCalculation(session.db.schema(), field)) {
+    // Nothing reads the field: the record alone changes.
+    RecordStep step;
+    ByteView before = session.db.record(index);
+    step.before.assign(before.begin(), before.end());
+    step.after = stored;
+    step.beforeIndex = step.afterIndex = index;
+    step.inPlace = true;
+    session.db.ReplaceRecord(index, std::move(stored));
+    Finish(session);
+    if (history) history->Push(std::move(step));
+    return 0;
+  }
+  return StoreRecord(session, index, std::move(stored), changed, true, history).ok ? 0 : -1;
+}
+
+void DeleteRecordAt(DataSession& session, size_t index, RecordHistory* history) {
+  Database& db = session.db;
+  if (index >= db.recordCount()) return;
+  RecordStep step;
+  step.kind = RecordStep::Kind::Delete;
+  ByteView before = db.record(index);
+  step.before.assign(before.begin(), before.end());
+  step.beforeIndex = index;
+  step.attributes = db.entry(index).attributes();
+  step.uniqueID = db.entry(index).uniqueID();
+  db.DeleteRecord(index);
+  RecalculateAfterMove(session, index, index + 1);
+  Finish(session);
+  if (history) history->Push(std::move(step));
+}
+
+bool DeleteRecordCommand(DataSession& session, size_t index, LinkedRecordDeleter* linked,
+                         RecordHistory* history) {
+  if (index >= session.db.recordCount()) return false;
+  if (!Allowed(CheckAccess(session.db, secured::kDeleteRecords, session.ui))) return false;
+  if (!session.ui.AskYesNo(record_messages::kConfirmDelete, record_messages::kConfirmDeleteCaption)) {
+    return false;
+  }
+  if (linked && HasLinkFields(session.db) &&
+      session.ui.AskYesNo(link_messages::kDeleteLinkedQuestion, "QUESTION")) {
+    linked->DeleteLinkedTo(session.db, index);
+  }
+  DeleteRecordAt(session, index, history);
+  return true;
+}
+
+}  // namespace cx

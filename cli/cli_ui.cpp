@@ -39,14 +39,13 @@ bool CliUi::AskYesNo(const std::string& text, const std::string& caption) {
   return false;
 }
 
-bool CliUi::AskPassword(const std::string& expected) {
+std::optional<std::string> CliUi::PromptPassword(int attempt) {
+  if (attempt > 0) return std::nullopt;
   if (!passwordGiven_) {
     err_ << "This database asks for its password: give it with --password.\n";
-    return false;
+    return std::nullopt;
   }
-  if (password_ == expected) return true;
-  ShowMessage("Invalid Password", "ERROR", MessageIcon::Error);
-  return false;
+  return password_;
 }
 
 std::optional<std::string> CliUi::AskOpenFile(const std::string&, const std::string&) {

@@ -1,6 +1,7 @@
 // The user-interface port of the command-line tool: messages go to stderr;
 // questions are answered by --yes / --no and refused without them; the
-// password prompt is answered by --password.
+// password prompt is answered by --password, once: a wrong one is refused
+// rather than asked again.
 #pragma once
 
 #include <iosfwd>
@@ -17,7 +18,7 @@ class CliUi : public UiPort {
 
   void ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) override;
   bool AskYesNo(const std::string& text, const std::string& caption) override;
-  bool AskPassword(const std::string& expected) override;
+  std::optional<std::string> PromptPassword(int attempt) override;
   std::optional<std::string> AskOpenFile(const std::string& title, const std::string& filter) override;
   std::optional<std::string> AskSaveFile(const std::string& title, const std::string& filter,
                                          const std::string& suggested) override;

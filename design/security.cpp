@@ -1,6 +1,7 @@
 #include "design/security.h"
 
 #include <cctype>
+#include <optional>
 
 #include "engine/field_types.h"
 #include "engine/record_reader.h"
@@ -62,13 +63,23 @@ void SetLevel(Schema& schema, int op, int level) {
   schema.securityLevels = static_cast<uint16_t>(word);
 }
 
+bool AskForPassword(UiPort& ui, const std::string& expected) {
+  // The user may try as often as they like; only Cancel ends the prompt.
+  for (int attempt = 0;; ++attempt) {
+    std::optional<std::string> typed = ui.PromptPassword(attempt);
+    if (!typed) return false;
+    if (*typed == expected) return true;
+    ui.ShowMessage(security_messages::kInvalidPassword, "ERROR", MessageIcon::Error);
+  }
+}
+
 Access CheckAccess(const Schema& schema, int op, UiPort& ui, bool showMessage) {
   const int level = ReadLevel(schema, op);
   if (level == access_level::kFull) return Access::Granted;
   if (level == access_level::kViewOnly) return Access::ViewOnly;
   if (level == access_level::kPassword) {
     ui.SetBusy(false);
-    if (ui.AskPassword(schema.password.str())) return Access::Granted;
+    if (AskForPassword(ui, schema.password.str())) return Access::Granted;
   }
   if (showMessage) {
     ui.ShowMessage(security_messages::kDenied, security_messages::kDeniedCaption,
@@ -105,7 +116,7 @@ bool CheckOpenAccess(const Schema& schema, UiPort& ui) {
   if (level == 0) return true;
   if (level == 1) {
     ui.SetBusy(false);
-    return ui.AskPassword(schema.password.str());
+    return AskForPassword(ui, schema.password.str());
   }
   ui.ShowMessage(security_messages::kOpenDenied, security_messages::kDeniedCaption,
                  MessageIcon::Warning);

@@ -55,6 +55,12 @@ int ReadLevel(const Schema& schema, int op);
 // outside the word are not written.
 void SetLevel(Schema& schema, int op, int level);
 
+// The password prompt for a database whose password is `expected`: the
+// typed text must equal it exactly (letter case counts); a wrong one shows
+// "Invalid Password" / "ERROR" and prompts again until the user cancels.
+// True when the right password was given.
+bool AskForPassword(UiPort& ui, const std::string& expected);
+
 enum class Access { Refused = 0, Granted = 1, ViewOnly = 2 };
 
 // Callers other than the record editor treat view only as granted.

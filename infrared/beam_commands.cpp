@@ -21,13 +21,24 @@ class CountingUi : public UiPort {
   bool AskYesNo(const std::string& text, const std::string& caption) override {
     return inner_.AskYesNo(text, caption);
   }
-  bool AskPassword(const std::string& expected) override { return inner_.AskPassword(expected); }
+  Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
+    return inner_.AskYesNoCancel(text, caption);
+  }
+  std::optional<std::string> PromptPassword(int attempt) override {
+    return inner_.PromptPassword(attempt);
+  }
   std::optional<std::string> AskOpenFile(const std::string& t, const std::string& f) override {
     return inner_.AskOpenFile(t, f);
   }
   std::optional<std::string> AskSaveFile(const std::string& t, const std::string& f,
                                          const std::string& s) override {
     return inner_.AskSaveFile(t, f, s);
+  }
+  std::optional<std::string> ChooseOpenFile(const FileDialogRequest& r) override {
+    return inner_.ChooseOpenFile(r);
+  }
+  std::optional<std::string> ChooseSaveFile(const FileDialogRequest& r) override {
+    return inner_.ChooseSaveFile(r);
   }
   std::atomic<int> messages{0};
 

@@ -25,8 +25,8 @@ class TempDir {
   std::string path_;
 };
 
-// Records every message and answers questions from queues (an empty queue
-// answers No / cancel).
+// Records every message, question and file dialog, and answers from queues
+// (an empty queue answers No, Cancel, or cancels the dialog).
 class ScriptedUi : public UiPort {
  public:
   struct Message {
@@ -44,34 +44,64 @@ class ScriptedUi : public UiPort {
     yesNoAnswers.pop_front();
     return a;
   }
-  // Each queued entry is a sequence of typed passwords ending in a cancel;
-  // the first matching one grants (an "Invalid Password" message is recorded
-  // for each wrong one).
-  bool AskPassword(const std::string& expected) override {
-    ++passwordPrompts;
-    if (passwordAnswers.empty()) return false;
-    std::vector<std::string> tries = passwordAnswers.front();
-    passwordAnswers.pop_front();
-    for (const auto& t : tries) {
-      if (t == expected) return true;
-      messages.push_back({"Invalid Password", "ERROR"});
+  Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
+    questions.push_back({text, caption});
+    ++yesNoCancelAsked;
+    if (yesNoCancelAnswers.empty()) return Answer::Cancel;
+    Answer a = yesNoCancelAnswers.front();
+    yesNoCancelAnswers.pop_front();
+    return a;
+  }
+  // Each queued entry of passwordAnswers is one showing of the prompt: the
+  // passwords typed in turn, then a cancel. A showing starts at attempt 0.
+  std::optional<std::string> PromptPassword(int attempt) override {
+    if (attempt == 0) {
+      ++passwordPrompts;
+      typing_.clear();
+      if (!passwordAnswers.empty()) {
+        typing_.assign(passwordAnswers.front().begin(), passwordAnswers.front().end());
+        passwordAnswers.pop_front();
+      }
+    }
+    if (typing_.empty()) return std::nullopt;
+    std::string typed = typing_.front();
+    typing_.pop_front();
+    return typed;
+  }
+  std::optional<std::string> AskOpenFile(const std::string& title, const std::string& filter) override {
+    return ChooseOpenFile({title, filter, "", "", ""});
+  }
+  std::optional<std::string> AskSaveFile(const std::string& title, const std::string& filter,
+                                         const std::string& suggested) override {
+    return ChooseSaveFile({title, filter, "", suggested, ""});
+  }
+  std::optional<std::string> ChooseOpenFile(const FileDialogRequest& request) override {
+    openRequests.push_back(request);
+    return PopFile();
+  }
+  std::optional<std::string> ChooseSaveFile(const FileDialogRequest& request) override {
+    saveRequests.push_back(request);
+    return PopFile();
+  }
+
+  // True when a message with this text was shown.
+  bool Showed(const std::string& text) const {
+    for (const auto& m : messages) {
+      if (m.text == text) return true;
     }
     return false;
-  }
-  std::optional<std::string> AskOpenFile(const std::string&, const std::string&) override {
-    return PopFile();
-  }
-  std::optional<std::string> AskSaveFile(const std::string&, const std::string&,
-                                         const std::string&) override {
-    return PopFile();
   }
 
   std::vector<Message> messages;
   std::vector<Message> questions;
   std::deque<bool> yesNoAnswers;
+  std::deque<Answer> yesNoCancelAnswers;
   std::deque<std::vector<std::string>> passwordAnswers;
   std::deque<std::optional<std::string>> fileAnswers;
+  std::vector<FileDialogRequest> openRequests;
+  std::vector<FileDialogRequest> saveRequests;
   int passwordPrompts = 0;
+  int yesNoCancelAsked = 0;
 
  private:
   std::optional<std::string> PopFile() {
@@ -80,6 +110,7 @@ class ScriptedUi : public UiPort {
     fileAnswers.pop_front();
     return f;
   }
+  std::deque<std::string> typing_;
 };
 
 }  // namespace cx::testing

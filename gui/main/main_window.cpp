@@ -1,0 +1,577 @@
+#include "gui/main/main_window.h"
+
+#include <QAction>
+#include <QApplication>
+#include <QCloseEvent>
+#include <QHBoxLayout>
+#include <QHeaderView>
+#include <QItemSelectionModel>
+#include <QLabel>
+#include <QMenu>
+#include <QMenuBar>
+#include <QMessageBox>
+#include <QToolBar>
+#include <QVBoxLayout>
+#include <memory>
+
+#include "app/preferences.h"
+#include "design/security.h"
+#include "gui/common/help.h"
+#include "gui/common/icons.h"
+#include "gui/common/qt_ui_port.h"
+#include "gui/common/text.h"
+#include "gui/main/delete_records_dialog.h"
+#include "gui/main/preferences_dialog.h"
+#include "gui/main/record_list_model.h"
+#include "gui/main/record_list_view.h"
+#include "gui/main/start_dialog.h"
+
+namespace cx::gui {
+
+MainWindow::MainWindow(Workspace& workspace, QtUiPort& ui, QWidget* parent)
+    : QMainWindow(parent), workspace_(workspace), ui_(ui) {
+  setObjectName(QStringLiteral("mainWindow"));
+  setWindowIcon(AppIcon());
+  ui_.SetParent(this);
+
+  auto* central = new QWidget(this);
+  auto* layout = new QVBoxLayout(central);
+  layout->setContentsMargins(0, 4, 0, 0);
+  layout->setSpacing(4);
+  auto* labels = new QHBoxLayout;
+  labels->setContentsMargins(8, 0, 8, 0);
+  title_ = new QLabel(central);
+  title_->setObjectName(QStringLiteral("titleLabel"));
+  title_->setTextFormat(Qt::PlainText);
+  QFont bold = title_->font();
+  bold.setBold(true);
+  title_->setFont(bold);
+  status_ = new QLabel(central);
+  status_->setObjectName(QStringLiteral("statusLabel"));
+  status_->setTextFormat(Qt::PlainText);
+  status_->setAlignment(Qt::AlignRight | Qt::AlignVCenter);
+  labels->addWidget(title_, 1);
+  labels->addWidget(status_);
+  layout->addLayout(labels);
+
+  model_ = new RecordListModel(this);
+  list_ = new RecordListView(central);
+  list_->setModel(model_);
+  list_->setFrameShape(QFrame::NoFrame);
+  layout->addWidget(list_, 1);
+  setCentralWidget(central);
+
+  connect(list_, &RecordListView::cellTapped, this, &MainWindow::cellTapped);
+  connect(list_, &RecordListView::headingClicked, this, &MainWindow::showHeadingMenu);
+  connect(list_, &RecordListView::columnWidthChosen, this, &MainWindow::columnWidthChosen);
+  connect(list_, &RecordListView::autoFitRequested, this, &MainWindow::autoFit);
+  // Moving the selection with the keyboard moves the current record too, so
+  // that it is the one a save remembers.
+  connect(list_->selectionModel(), &QItemSelectionModel::currentRowChanged, this,
+          [this](const QModelIndex& now) {
+            Document* doc = document();
+            if (selecting_ || !doc || !now.isValid() || now.row() >= static_cast<int>(doc->rowCount())) return;
+            selecting_ = true;
+            doc->SetCurrentRecord(doc->recordAt(now.row()));
+            selecting_ = false;
+          });
+
+  BuildMenus();
+  BuildToolBar();
+  InstallHelpShortcut(this, QString::fromLatin1(kHelpContents));
+
+  workspace_.AddListener(this);
+  AttachShownDocument();
+  resize(760, 520);
+}
+
+MainWindow::~MainWindow() {
+  workspace_.RemoveListener(this);
+  if (attached_) attached_->RemoveListener(this);
+}
+
+QAction* MainWindow::AddCommand(QMenu* menu, const QString& text, const QKeySequence& shortcut,
+                                void (MainWindow::*slot)()) {
+  QAction* action = menu->addAction(text);
+  action->setObjectName(text);
+  if (!shortcut.isEmpty()) action->setShortcut(shortcut);
+  connect(action, &QAction::triggered, this, slot);
+  actions_[text] = action;
+  return action;
+}
+
+QAction* MainWindow::action(const QString& text) const {
+  auto it = actions_.find(text);
+  return it == actions_.end() ? nullptr : it->second;
+}
+
+void MainWindow::BuildMenus() {
+  QMenu* file = menuBar()->addMenu(QStringLiteral("&File"));
+  AddCommand(file, QStringLiteral("New"), QKeySequence::New, &MainWindow::newDatabase);
+  AddCommand(file, QStringLiteral("Open..."), QKeySequence::Open, &MainWindow::openDatabase);
+  reopenMenu_ = file->addMenu(QStringLiteral("Reopen"));
+  reopenMenu_->setObjectName(QStringLiteral("reopenMenu"));
+  connect(reopenMenu_, &QMenu::aboutToShow, this, &MainWindow::RebuildReopenMenu);
+  RebuildReopenMenu();
+  file->addSeparator();
+  saveAction_ = AddCommand(file, QStringLiteral("Save"), QKeySequence::Save, &MainWindow::saveDatabase);
+  needsOpen_.push_back(
+      AddCommand(file, QStringLiteral("Save As..."), QKeySequence::SaveAs, &MainWindow::saveDatabaseAs));
+  needsOpen_.push_back(AddCommand(file, QStringLiteral("Close"), QKeySequence::Close, &MainWindow::closeDatabase));
+  file->addSeparator();
+  AddCommand(file, QStringLiteral("Preferences..."), QKeySequence(), &MainWindow::editPreferences);
+  file->addSeparator();
+  AddCommand(file, QStringLiteral("Exit"), QKeySequence::Quit, &MainWindow::exitProgram);
+
+  QMenu* records = menuBar()->addMenu(QStringLiteral("&Records"));
+  newRecordAction_ = AddCommand(records, QStringLiteral("New Record"), QKeySequence(Qt::CTRL | Qt::SHIFT | Qt::Key_N),
+                                &MainWindow::newRecord);
+  newRecordAction_->setIcon(NewRecordIcon());
+  newRecordAction_->setObjectName(QStringLiteral("newRecordAction"));
+  records->addSeparator();
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Find..."), QKeySequence::Find, &MainWindow::showFindDialog));
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Find Again"), QKeySequence(Qt::Key_F3), &MainWindow::findAgain));
+  records->addSeparator();
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Sort..."), QKeySequence(), &MainWindow::showSortDialog));
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Filter..."), QKeySequence(), &MainWindow::showFilterDialog));
+  records->addSeparator();
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Run Report..."), QKeySequence(), &MainWindow::runReport));
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Print Records..."), QKeySequence::Print, &MainWindow::printRecords));
+  records->addSeparator();
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Move Records To..."), QKeySequence(), &MainWindow::moveRecordsTo));
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Copy Records To..."), QKeySequence(), &MainWindow::copyRecordsTo));
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Export Records..."), QKeySequence(), &MainWindow::exportRecords));
+  needsOpen_.push_back(AddCommand(records, QStringLiteral("Import Records..."), QKeySequence(), &MainWindow::importRecords));
+  records->addSeparator();
+  needsOpen_.push_back(
+      AddCommand(records, QStringLiteral("Delete Records..."), QKeySequence::Delete, &MainWindow::deleteRecords));
+
+  QMenu* database = menuBar()->addMenu(QStringLiteral("&Database"));
+  needsOpen_.push_back(
+      AddCommand(database, QStringLiteral("DB Properties..."), QKeySequence(), &MainWindow::dbPropertiesCommand));
+
+  QMenu* beam = menuBar()->addMenu(QStringLiteral("&Beam"));
+  needsOpen_.push_back(AddCommand(beam, QStringLiteral("Beam Records..."), QKeySequence(), &MainWindow::beamRecordsCommand));
+  needsOpen_.push_back(AddCommand(beam, QStringLiteral("Beam Database..."), QKeySequence(), &MainWindow::beamDatabaseCommand));
+  beam->addSeparator();
+  AddCommand(beam, QStringLiteral("Receive Via Infrared..."), QKeySequence(), &MainWindow::receiveViaInfrared);
+
+  QMenu* help = menuBar()->addMenu(QStringLiteral("&Help"));
+  QAction* contents = AddCommand(help, QStringLiteral("Cardovex Help"), QKeySequence(), &MainWindow::showHelpContents);
+  contents->setShortcut(QKeySequence::HelpContents);
+  // The window's own F1 shortcut serves the key; the menu shows it.
+  contents->setShortcutContext(Qt::WidgetShortcut);
+  help->addSeparator();
+  AddCommand(help, QStringLiteral("About"), QKeySequence(), &MainWindow::showAbout);
+
+  // Menu entries are greyed when their menu opens and after every change;
+  // the refresh on opening catches anything the other refreshes missed.
+  for (QMenu* menu : {file, records, database, beam}) {
+    connect(menu, &QMenu::aboutToShow, this, &MainWindow::UpdateCommandState);
+  }
+}
+
+void MainWindow::BuildToolBar() {
+  QToolBar* bar = addToolBar(QStringLiteral("Records"));
+  bar->setObjectName(QStringLiteral("toolBar"));
+  bar->setMovable(false);
+  bar->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
+  bar->addAction(newRecordAction_);
+  backAction_ = new QAction(BackIcon(), QStringLiteral("Back"), this);
+  backAction_->setObjectName(QStringLiteral("backAction"));
+  backAction_->setToolTip(QStringLiteral("Back to the database this one was opened from"));
+  backAction_->setShortcut(QKeySequence(Qt::ALT | Qt::Key_Left));
+  connect(backAction_, &QAction::triggered, this, &MainWindow::backToParent);
+  bar->addAction(backAction_);
+}
+
+void MainWindow::RebuildReopenMenu() {
+  reopenMenu_->clear();
+  for (const RecentFiles::ReopenEntry& entry : context().recent.ReopenEntries()) {
+    QAction* a = reopenMenu_->addAction(EscapeMnemonic(FromDb(entry.name)));
+    a->setToolTip(QString::fromStdString(entry.path));
+    const int n = entry.n;
+    connect(a, &QAction::triggered, this, [this, n] { reopenDatabase(n); });
+  }
+  reopenMenu_->addSeparator();
+  QAction* more = reopenMenu_->addAction(QStringLiteral("More Files..."));
+  more->setObjectName(QStringLiteral("More Files..."));
+  connect(more, &QAction::triggered, this, &MainWindow::openDatabase);
+}
+
+void MainWindow::UpdateCommandState() {
+  const Document* doc = workspace_.shown();
+  const bool open = doc != nullptr;
+  for (QAction* a : needsOpen_) a->setEnabled(open);
+  saveAction_->setEnabled(open && doc->changed());
+  newRecordAction_->setEnabled(open);
+  backAction_->setEnabled(workspace_.level() > 0);
+  UpdateLabels();
+}
+
+void MainWindow::UpdateLabels() {
+  title_->setText(FromDb(workspace_.TitleLabel()));
+  status_->setText(FromDb(workspace_.StatusLabel()));
+  setWindowTitle(FromDb(workspace_.WindowTitle()));
+}
+
+// --- Following the shown document ------------------------------------------
+
+void MainWindow::AttachShownDocument() {
+  Document* doc = workspace_.shown();
+  if (doc != attached_) {
+    if (attached_) attached_->RemoveListener(this);
+    attached_ = doc;
+    if (attached_) attached_->AddListener(this);
+  }
+  model_->SetDocument(attached_);
+  list_->ApplyColumnWidths();
+  SelectCurrentRecord();
+  UpdateCommandState();
+}
+
+void MainWindow::RebuildList() {
+  QApplication::setOverrideCursor(Qt::WaitCursor);
+  if (Document* doc = document()) doc->RebuildView();  // tells ViewRebuilt
+  AttachShownDocument();
+  QApplication::restoreOverrideCursor();
+}
+
+void MainWindow::SelectCurrentRecord() {
+  Document* doc = attached_;
+  if (!doc) return;
+  selecting_ = true;
+  list_->SelectRow(doc->rowOf(doc->currentRecord()));
+  selecting_ = false;
+}
+
+void MainWindow::LevelPushed(int, Document&) {
+  // The document beneath stays alive: stop listening to it.
+  AttachShownDocument();
+}
+
+void MainWindow::LevelPopped(int, Document&) {
+  attached_ = nullptr;  // the closed level's document is gone
+  AttachShownDocument();
+}
+
+void MainWindow::DocumentOpened(Document&) { AttachShownDocument(); }
+
+void MainWindow::DocumentClosed() {
+  attached_ = nullptr;
+  AttachShownDocument();
+}
+
+void MainWindow::DocumentReplaced(Document&) {
+  attached_ = nullptr;
+  AttachShownDocument();
+}
+
+void MainWindow::ViewRebuilt() {
+  model_->Reset();
+  list_->ApplyColumnWidths();
+  SelectCurrentRecord();
+  UpdateCommandState();
+}
+
+void MainWindow::RecordChanged(size_t recordIndex) { model_->RecordChanged(recordIndex); }
+
+void MainWindow::ColumnsChanged() {
+  model_->Reset();
+  list_->ApplyColumnWidths();
+  SelectCurrentRecord();
+  UpdateCommandState();
+}
+
+void MainWindow::ChangedMarkToggled(bool) { UpdateCommandState(); }
+
+void MainWindow::CurrentRecordChanged(size_t) {
+  if (!selecting_) SelectCurrentRecord();
+}
+
+void MainWindow::FoundRecordChanged() {
+  Document* doc = attached_;
+  if (!doc || doc->found().index < 0) return;
+  const int row = doc->rowOf(static_cast<size_t>(doc->found().index));
+  if (row < 0) return;
+  selecting_ = true;
+  list_->SelectRow(row);
+  const int column = model_->ColumnOfField(doc->found().field);
+  if (column >= 0) list_->scrollTo(model_->index(row, column));
+  selecting_ = false;
+  list_->setFocus();
+}
+
+// --- File commands -------------------------------------------------------------
+
+void MainWindow::OpenPath(const std::string& path) {
+  WaitCursor wait;
+  workspace_.Open(path);
+  UpdateCommandState();
+}
+
+void MainWindow::newDatabase() {
+  if (!workspace_.New()) return;
+  AttachShownDocument();
+  // A new database is defined in the properties dialog before anything
+  // else happens to it.
+  showDbProperties();
+  RebuildList();
+}
+
+void MainWindow::openDatabase() {
+  workspace_.OpenWithDialog();
+  UpdateCommandState();
+}
+
+void MainWindow::reopenDatabase(int n) {
+  WaitCursor wait;
+  workspace_.Reopen(n);
+  UpdateCommandState();
+}
+
+void MainWindow::saveDatabase() {
+  if (!RequireOpen() || !document()->changed()) return;
+  workspace_.Save();
+  UpdateCommandState();
+}
+
+void MainWindow::saveDatabaseAs() {
+  if (!RequireOpen()) return;
+  workspace_.SaveAs();
+  UpdateCommandState();
+}
+
+void MainWindow::closeDatabase() {
+  if (!RequireOpen()) return;
+  const int level = workspace_.level();
+  if (!workspace_.Close()) {
+    UpdateCommandState();
+    return;
+  }
+  UpdateCommandState();
+  if (level > 0) {
+    resumeAfterLinkedLevel();
+  } else {
+    ShowStartDialog();
+  }
+}
+
+void MainWindow::backToParent() {
+  if (workspace_.level() == 0) return;
+  closeDatabase();
+}
+
+void MainWindow::exitProgram() { close(); }
+
+void MainWindow::closeEvent(QCloseEvent* event) {
+  // Closing the window is Exit: the save decisions may still be cancelled.
+  if (!workspace_.Exit()) {
+    event->ignore();
+    UpdateCommandState();
+    return;
+  }
+  event->accept();
+}
+
+void MainWindow::editPreferences() {
+  PreferencesDialog dialog(context().preferences.flags, this);
+  if (dialog.exec() == QDialog::Accepted) context().preferences.flags = dialog.flags();
+}
+
+void MainWindow::ShowStartDialog() {
+  StartDialog dialog(context().recent.StartList(), this);
+  if (dialog.exec() != QDialog::Accepted) return;
+  switch (dialog.choice()) {
+    case StartDialog::Choice::New:
+      newDatabase();
+      break;
+    case StartDialog::Choice::Open: {
+      const int index = dialog.listIndex();
+      if (index == 0) {
+        openDatabase();
+      } else if (auto path = context().recent.StartChoice(index)) {
+        OpenPath(*path);
+      }
+      break;
+    }
+    case StartDialog::Choice::None:
+      break;
+  }
+}
+
+// --- Commands of the list ------------------------------------------------------
+
+bool MainWindow::Allowed(int operation) {
+  Document* doc = document();
+  return doc && cx::Allowed(CheckAccess(doc->db(), operation, ui_));
+}
+
+void MainWindow::findAgain() {
+  Document* doc = document();
+  if (!doc) return;
+  std::optional<int> hit;
+  {
+    WaitCursor wait;
+    hit = doc->FindAgain();
+  }
+  if (!hit) showFindDialog();
+}
+
+void MainWindow::deleteRecords() {
+  if (!Allowed(secured::kDeleteRecords)) return;
+  DeleteRecordsDialog dialog(this);
+  if (dialog.exec() != QDialog::Accepted) return;
+  WaitCursor wait;
+  document()->DeleteRecords(dialog.scope());
+  UpdateCommandState();
+}
+
+void MainWindow::cellTapped(int row, int column) {
+  Document* doc = document();
+  if (!doc || row < 0 || row >= static_cast<int>(doc->rowCount())) return;
+  selecting_ = true;
+  doc->SetCurrentRecord(doc->recordAt(row));
+  list_->SelectRow(row);
+  selecting_ = false;
+  list_->viewport()->repaint();
+  openRecordAt(row, column);
+}
+
+void MainWindow::showHeadingMenu(int column) {
+  Document* doc = document();
+  const int field = model_->FieldOfColumn(column);
+  if (!doc || field < 0) return;
+  std::unique_ptr<QMenu> menu(CreateHeadingMenu(this));
+  QHeaderView* header = list_->horizontalHeader();
+  const QPoint at = header->mapToGlobal(QPoint(header->sectionViewportPosition(column), header->height()));
+  QAction* chosen = menu->exec(at);
+  // The menu answers at once; the command runs after it has gone.
+  const int entry = chosen ? menu->actions().indexOf(chosen) : -1;
+  menu.reset();
+  switch (entry) {
+    case 0: sortFromHeading(field, true); break;
+    case 1: sortFromHeading(field, false); break;
+    case 2: fieldPropertiesCommand(field); break;
+    case 3: headingReportCommand(field); break;
+    case 4: hideField(field); break;
+    default: break;
+  }
+}
+
+QMenu* MainWindow::CreateHeadingMenu(QWidget* parent) {
+  auto* menu = new QMenu(parent);
+  menu->setObjectName(QStringLiteral("headingMenu"));
+  for (const char* text : {"Sort Forward", "Sort Reverse", "Field Properties", "Run Report", "Hide Field"}) {
+    menu->addAction(QString::fromLatin1(text))->setObjectName(QString::fromLatin1(text));
+  }
+  return menu;
+}
+
+void MainWindow::sortFromHeading(int field, bool forward) {
+  if (Document* doc = document()) {
+    WaitCursor wait;
+    doc->SortFromHeader(field, forward);
+  }
+}
+
+void MainWindow::hideField(int field) {
+  if (Document* doc = document()) doc->HideField(field);
+}
+
+void MainWindow::fieldPropertiesCommand(int field) {
+  // The heading is a second way into the design: it is guarded the same.
+  if (!Allowed(secured::kDBProperties)) return;
+  showFieldProperties(field);
+}
+
+void MainWindow::headingReportCommand(int field) {
+  Document* doc = document();
+  if (!doc || !doc->CanRunReport(field)) return;
+  runHeadingReport(field);
+}
+
+void MainWindow::dbPropertiesCommand() {
+  if (!Allowed(secured::kDBProperties)) return;
+  showDbProperties();
+}
+
+void MainWindow::beamRecordsCommand() {
+  if (!Allowed(secured::kBeamData)) return;
+  beamRecords();
+}
+
+void MainWindow::beamDatabaseCommand() {
+  if (!Allowed(secured::kBeamData)) return;
+  beamDatabase();
+}
+
+void MainWindow::columnWidthChosen(int column, int pixels) {
+  Document* doc = document();
+  const int field = model_->FieldOfColumn(column);
+  if (!doc || field < 0) return;
+  doc->SetColumnPixels(field, pixels);
+  UpdateCommandState();
+}
+
+void MainWindow::autoFit(int column) {
+  Document* doc = document();
+  const int field = model_->FieldOfColumn(column);
+  if (!doc || field < 0) return;
+  const QFontMetrics metrics = list_->fontMetrics();
+  WaitCursor wait;
+  doc->AutoFit(field, [&metrics](const std::string& text) { return metrics.horizontalAdvance(FromDb(text)); });
+}
+
+void MainWindow::showHelpContents() { ShowHelp(this, QString::fromLatin1(kHelpContents)); }
+
+void MainWindow::showAbout() {
+  std::unique_ptr<QDialog> box(CreateAboutBox(this));
+  box->exec();
+}
+
+QDialog* MainWindow::CreateAboutBox(QWidget* parent) {
+  auto* box = new QMessageBox(parent);
+  box->setObjectName(QStringLiteral("aboutBox"));
+  box->setWindowTitle(QStringLiteral("About Cardovex"));
+  box->setIconPixmap(QPixmap::fromImage(AppIconImage(64)));
+  box->setTextFormat(Qt::RichText);
+  box->setText(QStringLiteral("<h3>Cardovex %1</h3>").arg(QString::fromLatin1(CARDOVEX_VERSION)));
+  box->setInformativeText(
+      QStringLiteral("A personal database manager for small databases of typed fields.<br>"
+                     "Reads and writes database files of version %1.<br><br>"
+                     "Built with Qt %2.")
+          .arg(QString::fromLatin1(ProgramVersion()), QString::fromLatin1(qVersion())));
+  box->setStandardButtons(QMessageBox::Ok);
+  return box;
+}
+
+// --- Slots of the dialog modules -------------------------------------------------
+
+void MainWindow::NotAvailableYet(const QString& command) {
+  QMessageBox::information(this, command, QStringLiteral("This command is not available yet."));
+}
+
+void MainWindow::openRecordAt(int, int) { NotAvailableYet(QStringLiteral("Edit Record")); }
+void MainWindow::newRecord() {
+  if (!RequireOpen()) return;
+  NotAvailableYet(QStringLiteral("New Record"));
+}
+void MainWindow::resumeAfterLinkedLevel() {}
+void MainWindow::showDbProperties() { NotAvailableYet(QStringLiteral("DB Properties...")); }
+void MainWindow::showFieldProperties(int) { NotAvailableYet(QStringLiteral("Field Properties")); }
+void MainWindow::showSortDialog() { NotAvailableYet(QStringLiteral("Sort...")); }
+void MainWindow::showFilterDialog() { NotAvailableYet(QStringLiteral("Filter...")); }
+void MainWindow::showFindDialog() { NotAvailableYet(QStringLiteral("Find...")); }
+void MainWindow::runReport() { NotAvailableYet(QStringLiteral("Run Report...")); }
+void MainWindow::runHeadingReport(int) { NotAvailableYet(QStringLiteral("Run Report")); }
+void MainWindow::exportRecords() { NotAvailableYet(QStringLiteral("Export Records...")); }
+void MainWindow::importRecords() { NotAvailableYet(QStringLiteral("Import Records...")); }
+void MainWindow::moveRecordsTo() { NotAvailableYet(QStringLiteral("Move Records To...")); }
+void MainWindow::copyRecordsTo() { NotAvailableYet(QStringLiteral("Copy Records To...")); }
+void MainWindow::printRecords() { NotAvailableYet(QStringLiteral("Print Records...")); }
+void MainWindow::beamRecords() { NotAvailableYet(QStringLiteral("Beam Records...")); }
+void MainWindow::beamDatabase() { NotAvailableYet(QStringLiteral("Beam Database...")); }
+void MainWindow::receiveViaInfrared() { NotAvailableYet(QStringLiteral("Receive Via Infrared...")); }
+
+}  // namespace cx::gui

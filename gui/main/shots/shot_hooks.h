@@ -1,0 +1,16 @@
+// The screenshot functions of the GUI modules, called in this order. A
+// module adds its declaration and its entry in kShotHooks.
+#pragma once
+
+#include "gui/main/shots/shot_context.h"
+
+namespace cx::gui {
+
+void AddMainShots(ShotContext& shots);
+
+using ShotHook = void (*)(ShotContext&);
+inline constexpr ShotHook kShotHooks[] = {
+    &AddMainShots,
+};
+
+}  // namespace cx::gui

@@ -37,6 +37,13 @@ size_t Locate(const Database& db, const uint8_t* identity, size_t fallback) {
   return fallback;
 }
 
+// The folder a dialog starts in: the file's own, without its final slash.
+std::string FolderOf(const std::string& path) {
+  std::string folder = FolderPart(path);
+  if (folder.size() > 1 && folder.back() == '/') folder.pop_back();
+  return folder;
+}
+
 std::string Substitute(const char* pattern, const std::string& text) {
   std::string s = pattern;
   if (size_t at = s.find("%s"); at != std::string::npos) s.replace(at, 2, text);
@@ -419,7 +426,7 @@ std::optional<std::string> Workspace::AskSavePath(const Document& doc, const std
   FileDialogRequest request;
   request.title = file_messages::kSaveTitle;
   request.filter = link_messages::kFileFilter;
-  request.folder = doc.neverSaved() ? context_.dataFolder : FolderPart(doc.path());
+  request.folder = doc.neverSaved() ? context_.dataFolder : FolderOf(doc.path());
   request.fileName = proposed;
   request.defaultSuffix = file_messages::kDefaultSuffix;
   context_.ui.SetBusy(false);
@@ -554,7 +561,7 @@ bool Workspace::OpenWithDialog() {
   request.title = file_messages::kOpenTitle;
   request.filter = link_messages::kFileFilter;
   const Document* doc = documents_[0] && levels_.level(0).open() ? documents_[0].get() : nullptr;
-  request.folder = doc && !doc->neverSaved() ? FolderPart(doc->path()) : context_.dataFolder;
+  request.folder = doc && !doc->neverSaved() ? FolderOf(doc->path()) : context_.dataFolder;
   request.defaultSuffix = file_messages::kDefaultSuffix;
   context_.ui.SetBusy(false);
   std::optional<std::string> chosen = context_.ui.ChooseOpenFile(request);
@@ -601,6 +608,7 @@ bool Workspace::Close() {
 bool Workspace::Exit() {
   if (!DecideAllLevels(SaveDecisionMode{true, false})) return false;
   RememberLastFile();
+  exited_ = true;
   const bool wasOpen = isOpen();
   // Changes the user chose to discard must not be saved by the silent
   // decision at the very end.
@@ -610,16 +618,21 @@ bool Workspace::Exit() {
 }
 
 void Workspace::Shutdown() {
-  if (isOpen()) {
+  // After Exit the databases are closed and LastFileUsed names what was
+  // open then; otherwise (the window closed by the system) both happen here.
+  if (!exited_) {
+    const bool wasOpen = isOpen();
     DecideAllLevels(SaveDecisionMode{false, true});
     RememberLastFile();
     ReleaseAll();
-    Tell([](WorkspaceListener& l) { l.DocumentClosed(); });
+    if (wasOpen) Tell([](WorkspaceListener& l) { l.DocumentClosed(); });
   }
+  exited_ = false;
   context_.preferences.Write();
 }
 
 bool Workspace::Start(const std::vector<std::string>& commandLineFiles) {
+  exited_ = false;
   context_.preferences.WriteVersion(ProgramVersion());
   std::error_code ec;
   if (!context_.dataFolder.empty()) std::filesystem::create_directories(context_.dataFolder, ec);

@@ -308,6 +308,7 @@ class Workspace {
   ViewLevelStack levels_;
   std::vector<std::unique_ptr<Document>> documents_;  // index: level
   std::vector<WorkspaceListener*> listeners_;
+  bool exited_ = false;  // Exit has run its decisions and closed everything
 };
 
 namespace file_messages {

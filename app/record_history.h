@@ -10,7 +10,9 @@
 #include <cstddef>
 #include <cstdint>
 #include <deque>
+#include <algorithm>
 #include <map>
+#include <vector>
 
 #include "engine/record.h"
 #include "ops/session.h"
@@ -53,6 +55,13 @@ class RecordHistories {
  public:
   RecordHistory& For(const Database* db) { return byDatabase_[db]; }
   void Forget(const Database* db) { byDatabase_.erase(db); }
+  // Drops the histories of every database not in `open`: a database let go
+  // may be followed by another at the same address.
+  void KeepOnly(const std::vector<const Database*>& open) {
+    std::erase_if(byDatabase_, [&](const auto& entry) {
+      return std::find(open.begin(), open.end(), entry.first) == open.end();
+    });
+  }
 
  private:
   std::map<const Database*, RecordHistory> byDatabase_;

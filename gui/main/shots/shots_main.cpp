@@ -2,8 +2,10 @@
 // on copies of the sample databases, for the README and for looking at.
 //
 //   cardovex-shots --samples DIR --out DIR
+//   cardovex-shots --icons DIR      (the application icon in its sizes)
 #include <QApplication>
 #include <QCommandLineParser>
+#include <QDir>
 #include <QTemporaryDir>
 #include <cstdio>
 
@@ -21,7 +23,17 @@ int main(int argc, char** argv) {
   parser.addHelpOption();
   parser.addOption({QStringLiteral("samples"), QStringLiteral("Folder of the sample databases."), QStringLiteral("dir")});
   parser.addOption({QStringLiteral("out"), QStringLiteral("Folder for the pictures."), QStringLiteral("dir")});
+  parser.addOption({QStringLiteral("icons"), QStringLiteral("Write the application icon's PNGs."), QStringLiteral("dir")});
   parser.process(app);
+  if (parser.isSet(QStringLiteral("icons"))) {
+    const QDir dir(parser.value(QStringLiteral("icons")));
+    for (int size : {16, 24, 32, 48, 64, 128, 256}) {
+      const QString file = dir.filePath(QStringLiteral("cardovex-%1.png").arg(size));
+      if (!cx::gui::AppIconImage(size).save(file)) return 1;
+      std::printf("%s\n", qPrintable(file));
+    }
+    return 0;
+  }
   if (!parser.isSet(QStringLiteral("samples")) || !parser.isSet(QStringLiteral("out"))) {
     std::fprintf(stderr, "usage: cardovex-shots --samples DIR --out DIR\n");
     return 2;

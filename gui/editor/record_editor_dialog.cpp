@@ -339,6 +339,7 @@ QWidget* RecordEditorDialog::MakeTextBox(int field, int height) {
   box->setFixedHeight(height + box->frameWidth() * 2 + 8);
   box->setTabChangesFocus(true);
   box->setReadOnly(viewOnly_);
+  box->installEventFilter(this);
   auto lastGood = std::make_shared<QString>(box->toPlainText());
   connect(box, &QPlainTextEdit::textChanged, this, [this, box, field, lastGood] {
     const QString now = box->toPlainText();
@@ -498,6 +499,19 @@ void RecordEditorDialog::keyPressEvent(QKeyEvent* event) {
     return;
   }
   QDialog::keyPressEvent(event);
+}
+
+bool RecordEditorDialog::eventFilter(QObject* watched, QEvent* event) {
+  // A text box would page through its own text: in this form the page
+  // keys go from record to record.
+  if (event->type() == QEvent::KeyPress) {
+    auto* key = static_cast<QKeyEvent*>(event);
+    if (key->modifiers() == Qt::NoModifier && (key->key() == Qt::Key_PageUp || key->key() == Qt::Key_PageDown)) {
+      Step(key->key() == Qt::Key_PageUp ? -1 : +1);
+      return true;
+    }
+  }
+  return QDialog::eventFilter(watched, event);
 }
 
 bool RecordEditorDialog::Apply() {

@@ -120,6 +120,7 @@ void Document::SortFromHeader(int field, bool forward) {
 }
 
 void Document::ApplyFilters(const FilterSettings& settings) {
+  BusyScope busy(context_.ui);
   StoreFilterSettings(settings, db().schema());
   db().MarkChanged();
   RebuildView();
@@ -127,12 +128,14 @@ void Document::ApplyFilters(const FilterSettings& settings) {
 }
 
 void Document::ApplyFilterDialog(const FilterDialogValues& values) {
+  BusyScope busy(context_.ui);
   AcceptFilterDialog(db(), values);
   RebuildView();
   NotifyChangedMark();
 }
 
 void Document::DisableFilters() {
+  BusyScope busy(context_.ui);
   DisableBothFilters(db());
   RebuildView();
   NotifyChangedMark();
@@ -445,6 +448,8 @@ bool Workspace::SaveDocument(Document& doc, const std::string& path, bool report
   }
   if (!status) {
     ui.ShowMessage(file_messages::kSaveFailed, file_messages::kUpdate, MessageIcon::Error);
+    // The box keeps its fixed text; the reason goes to the status line.
+    if (!status.message().empty() && status.message() != file_messages::kSaveFailed) ui.Status(status.message());
     return false;
   }
   context_.recent.Add(path);
@@ -461,9 +466,13 @@ bool Workspace::DecideSave(Document& doc, SaveDecisionMode mode) {
 
   if (mode.silent || (autoSave && !never)) {
     const std::string path = never ? FreeDefaultFileName(doc) : doc.path();
-    // A save that fails stops a command that can stop; at the end of the
-    // program there is nothing left to do but go on.
-    return SaveDocument(doc, path, false) || !mode.cancellable;
+    if (SaveDocument(doc, path, false)) return true;
+    // A command that can stop does, and the user decides. Without a user
+    // to ask, a copy in the data folder keeps the changes (the original
+    // file may be the one that cannot be written).
+    if (mode.cancellable) return false;
+    if (!never) SaveDocument(doc, FreeDefaultFileName(doc), false);
+    return true;
   }
 
   const std::string question =

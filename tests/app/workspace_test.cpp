@@ -199,6 +199,15 @@ TEST_F(WorkspaceTest, ShutdownSavesSilentlyAndNeverOverwrites) {
   }
 }
 
+TEST_F(WorkspaceTest, ShutdownKeepsChangesThatCannotGoToTheirFile) {
+  Document& doc = OpenChanged(WritePeople());
+  doc.db().SetPath(dir.File("gone/People.PDB"));
+  workspace.Shutdown();
+  ASSERT_EQ(ui.messages.size(), 1u);
+  EXPECT_EQ(ui.messages[0].text, "ERROR:File could not be saved");
+  EXPECT_EQ(Reread(dir.File("People1.PDB")).schema().field[1].width, 0);
+}
+
 TEST_F(WorkspaceTest, SaveCommand) {
   ASSERT_TRUE(workspace.New());
   Document& doc = *workspace.shown();

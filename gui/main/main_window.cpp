@@ -20,6 +20,7 @@
 #include "gui/common/icons.h"
 #include "gui/common/qt_ui_port.h"
 #include "gui/common/text.h"
+#include "gui/editor/editor_commands.h"
 #include "gui/main/delete_records_dialog.h"
 #include "gui/main/preferences_dialog.h"
 #include "gui/main/record_list_model.h"
@@ -77,6 +78,7 @@ MainWindow::MainWindow(Workspace& workspace, QtUiPort& ui, QWidget* parent)
           });
 
   BuildMenus();
+  InstallEditorCommands(this, workspace_);
   BuildToolBar();
   InstallHelpShortcut(this, QString::fromLatin1(kHelpContents));
 
@@ -552,12 +554,20 @@ void MainWindow::NotAvailableYet(const QString& command) {
   QMessageBox::information(this, command, QStringLiteral("This command is not available yet."));
 }
 
-void MainWindow::openRecordAt(int, int) { NotAvailableYet(QStringLiteral("Edit Record")); }
+void MainWindow::openRecordAt(int row, int column) {
+  const QRect cell = list_->visualRect(model_->index(row, column));
+  EditorCommandsOf(this, workspace_).OpenRecordAt(row, column, list_->viewport()->mapToGlobal(cell.topLeft()));
+  UpdateCommandState();
+}
 void MainWindow::newRecord() {
   if (!RequireOpen()) return;
-  NotAvailableYet(QStringLiteral("New Record"));
+  EditorCommandsOf(this, workspace_).NewRecord();
+  UpdateCommandState();
 }
-void MainWindow::resumeAfterLinkedLevel() {}
+void MainWindow::resumeAfterLinkedLevel() {
+  EditorCommandsOf(this, workspace_).ResumeAfterLinkedLevel();
+  UpdateCommandState();
+}
 void MainWindow::showDbProperties() { NotAvailableYet(QStringLiteral("DB Properties...")); }
 void MainWindow::showFieldProperties(int) { NotAvailableYet(QStringLiteral("Field Properties")); }
 void MainWindow::showSortDialog() { NotAvailableYet(QStringLiteral("Sort...")); }

@@ -4,13 +4,13 @@
 #include <filesystem>
 
 #include "app/preferences.h"
+#include "app/record_commit.h"
 #include "design/link_access.h"
 #include "design/security.h"
 #include "engine/container.h"
 #include "engine/database_folder.h"
 #include "engine/field_types.h"
 #include "engine/value_text.h"
-#include "ops/calc.h"
 #include "ops/find.h"
 #include "ops/open_database.h"
 #include "ops/sort.h"
@@ -219,32 +219,26 @@ bool Document::CanRunReport(int field) const {
 }
 
 StoreResult Document::StoreRecord(size_t recordIndexOrNew, Bytes stored) {
-  Database& d = db();
-  auto fail = [this]() {
-    context_.ui.ShowMessage(file_messages::kSavingRecord, "ERROR", MessageIcon::Error);
-    return StoreResult{Status::Error(file_messages::kSavingRecord), 0};
-  };
-  size_t placed = 0;
-  if (recordIndexOrNew == kNewRecord) {
-    const size_t count = d.recordCount();
-    if (!d.AppendRecord(std::move(stored))) return fail();
-    placed = InsertionPlace(d, count);
-    const uint8_t* identity = Identity(d, placed);
-    RecalculateAfterMove(session_, count, placed);
-    placed = Locate(d, identity, placed);
-  } else {
-    if (recordIndexOrNew >= d.recordCount()) return fail();
-    d.ReplaceRecord(recordIndexOrNew, std::move(stored));
-    placed = RepositionRecord(d, recordIndexOrNew);
-    const uint8_t* identity = Identity(d, placed);
-    RecalculateAfterMove(session_, recordIndexOrNew, placed);
-    placed = Locate(d, identity, placed);
-  }
-  d.MarkChanged();
-  current_ = placed;
-  RebuildView();
+  // Without word of which fields the user changed, every one counts as
+  // changed: the recalculation then reaches whatever could depend on them.
+  std::array<bool, format::kFieldCount> all;
+  all.fill(true);
+  return StoreRecord(recordIndexOrNew, std::move(stored), all);
+}
+
+StoreResult Document::StoreRecord(size_t recordIndexOrNew, Bytes stored,
+                                  const std::array<bool, format::kFieldCount>& changedFields) {
+  // One rule for writing a record back, shared with the record editor.
+  const size_t index = recordIndexOrNew == kNewRecord ? kNewRecordIndex : recordIndexOrNew;
+  const StoreOutcome outcome =
+      cx::StoreRecord(session_, index, std::move(stored), changedFields, false, nullptr);
+  if (!outcome.ok) return StoreResult{Status::Error(record_messages::kSavingError), 0};
+  current_ = outcome.index;
+  KeepCurrentInRange();
+  Notify(&DocumentListener::ViewRebuilt);
+  NotifyCurrent();
   NotifyChangedMark();
-  return StoreResult{Status::Ok(), placed};
+  return StoreResult{Status::Ok(), outcome.index};
 }
 
 bool Document::DeleteRecord(size_t index, bool alsoLinked) {
@@ -259,12 +253,11 @@ bool Document::DeleteRecord(size_t index, bool alsoLinked) {
     index = Locate(d, identity, index);
     if (index >= d.recordCount()) return false;
   }
-  d.DeleteRecord(index);
-  d.MarkChanged();
-  RecalculateAfterMove(session_, index, index + 1);
+  DeleteRecordAt(session_, index, nullptr);
   if (current_ != kNewRecord && current_ > index) --current_;
   KeepCurrentInRange();
-  RebuildView();
+  Notify(&DocumentListener::ViewRebuilt);
+  NotifyCurrent();
   NotifyChangedMark();
   return true;
 }

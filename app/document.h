@@ -9,6 +9,7 @@
 // GUI thread); listeners are called on it, synchronously.
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
@@ -19,6 +20,7 @@
 
 #include "app/columns.h"
 #include "app/view_levels.h"
+#include "engine/format.h"
 #include "engine/record.h"
 #include "ops/database_settings.h"
 #include "ops/delete_records.h"
@@ -158,11 +160,14 @@ class Document {
   // field's type has no report.
   bool CanRunReport(int field) const;
 
-  // The record editor's OK: writes `stored` (compact form) over record
-  // `recordIndexOrNew`, or adds it when that is kNewRecord; places it in
-  // sorted order, recalculates what the move affects, rebuilds the view and
-  // makes it the current record. The access checks are the caller's.
+  // Writes `stored` (compact form) over record `recordIndexOrNew`, or adds
+  // it when that is kNewRecord; places it in sorted order, recalculates what
+  // depends on it, rebuilds the view and makes it the current record. The
+  // access checks are the caller's. `changedFields` marks the fields the
+  // user changed (all, when not given), for the recalculation.
   StoreResult StoreRecord(size_t recordIndexOrNew, Bytes stored);
+  StoreResult StoreRecord(size_t recordIndexOrNew, Bytes stored,
+                          const std::array<bool, format::kFieldCount>& changedFields);
   // Deletes one record (with the records linked to it when `alsoLinked`),
   // recalculates and rebuilds the view. False when there is no such record.
   bool DeleteRecord(size_t index, bool alsoLinked);

@@ -158,7 +158,6 @@ std::optional<int> Document::FindAgain() {
 }
 
 size_t Document::DeleteRecords(DeleteScope scope) {
-  if (!Allowed(CheckAccess(db(), secured::kDeleteRecords, context_.ui))) return 0;
   LinkServices services = MakeLinkServices();
   LinkedRecordsDeleter linked(services);
   BusyScope busy(context_.ui);

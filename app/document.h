@@ -147,8 +147,10 @@ class Document {
   // Find Again: nullopt when there is no remembered text (the caller shows
   // the Find dialog instead); otherwise as Find.
   std::optional<int> FindAgain();
-  // Delete Records with the access check and the linked-records question;
-  // the number deleted (0 also when refused).
+  // Delete Records after the dialog's OK: the linked-records question when
+  // the database has Link fields, then the deletion. The "Delete Records"
+  // access check comes before the dialog and is the caller's
+  // (CommandAllowed), so that a password is asked once. The number deleted.
   size_t DeleteRecords(DeleteScope scope);
   void HideField(int field);
   // A divider drag: the width is stored (pixels x 2/3) and the database

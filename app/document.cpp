@@ -607,6 +607,9 @@ bool Workspace::Close() {
 }
 
 bool Workspace::Exit() {
+  // A second close of the window must not forget what the first one
+  // remembered.
+  if (exited_ && !isOpen()) return true;
   if (!DecideAllLevels(SaveDecisionMode{true, false})) return false;
   RememberLastFile();
   exited_ = true;

@@ -287,6 +287,7 @@ TEST_F(WorkspaceTest, LastFileUsedAcrossRuns) {
   settings.Set("LastFileUsed", path);
   ASSERT_TRUE(workspace.Start({}));
   EXPECT_TRUE(workspace.Exit());
+  EXPECT_TRUE(workspace.Exit());
   EXPECT_EQ(settings.Get("LastFileUsed"), path);
   workspace.Shutdown();
   EXPECT_EQ(settings.Get("LastFileUsed"), path);

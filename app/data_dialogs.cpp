@@ -90,7 +90,8 @@ std::string ReceiveAddressOrDefault(const std::optional<std::string>& setting) {
 std::optional<std::string> CheckReceiveAddress(const std::string& address) {
   std::string host;
   int port = 0;
-  if (address.empty() || !ParseHostPort(address, 0, host, port) || port == 0 || host.empty()) {
+  // Port 0 asks for any free port; the window shows which one it got.
+  if (!ParseHostPort(address, -1, host, port, /*allowPortZero=*/true) || port < 0) {
     return "Give the address to listen on as HOST:PORT, for example 0.0.0.0:6500.";
   }
   return std::nullopt;

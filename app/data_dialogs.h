@@ -30,7 +30,8 @@ std::string RememberPeer(const std::string& stored, const std::string& peer);
 // unusable: every interface, on a port that needs no privileges.
 inline constexpr char kDesktopReceiveAddress[] = "0.0.0.0:6500";
 std::string ReceiveAddressOrDefault(const std::optional<std::string>& setting);
-// "HOST:PORT" with a port of 1..65535: nothing, else the message to show.
+// "HOST:PORT" with a port of 0..65535 (0: any free one): nothing, else the
+// message to show.
 std::optional<std::string> CheckReceiveAddress(const std::string& address);
 
 // The file a database beam sends. A database without unsaved changes is

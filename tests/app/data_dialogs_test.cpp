@@ -79,8 +79,9 @@ TEST(ReceiveAddress, UnusableSettingsFallBackToAnUnprivilegedPort) {
   EXPECT_EQ(ReceiveAddressOrDefault(std::nullopt), kDesktopReceiveAddress);
   EXPECT_EQ(ReceiveAddressOrDefault(std::string("nonsense:port")), kDesktopReceiveAddress);
   EXPECT_EQ(ReceiveAddressOrDefault(std::string(" 127.0.0.1:7000 ")), "127.0.0.1:7000");
-  EXPECT_TRUE(CheckReceiveAddress("127.0.0.1:0"));
+  EXPECT_FALSE(CheckReceiveAddress("127.0.0.1:0"));
   EXPECT_TRUE(CheckReceiveAddress("127.0.0.1"));
+  EXPECT_TRUE(CheckReceiveAddress("127.0.0.1:65536"));
   EXPECT_FALSE(CheckReceiveAddress("[::1]:6500"));
 }
 

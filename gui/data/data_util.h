@@ -1,0 +1,57 @@
+// Small pieces the data dialogs share: the wait cursor, file-type lists in
+// the desktop's form, and the target of a command (the open database and
+// what to tell when its view changed).
+#pragma once
+
+#include <QGuiApplication>
+#include <QString>
+#include <functional>
+#include <string>
+
+#include "ops/session.h"
+
+class QWidget;
+
+namespace cx::gui {
+
+// Balanced with the constructor however the scope is left.
+class WaitCursor {
+ public:
+  WaitCursor();
+  ~WaitCursor();
+  WaitCursor(const WaitCursor&) = delete;
+  WaitCursor& operator=(const WaitCursor&) = delete;
+};
+
+// "Text Files (*.txt)|*.txt|All Files (*.*)|*.*||" as a file dialog's
+// filter ("Text Files (*.txt);;All Files (*)"); extensions match either case.
+QString DesktopFileFilter(const std::string& handheldFilter);
+
+// What a data command works on. `viewChanged` is told after records, their
+// order or the view changed (the list redraws); `columns` when the field
+// layout may differ too.
+struct DataTarget {
+  explicit DataTarget(DataSession& s, std::function<void()> changed = {}, std::string dataFolder = {})
+      : session(s), viewChanged(std::move(changed)), folder(std::move(dataFolder)) {}
+
+  DataSession& session;
+  std::function<void()> viewChanged;
+  // The folder new files are offered in (the data folder).
+  std::string folder;
+  // The record the editor or the list's selection stands on.
+  size_t current = 0;
+  // Selects and scrolls to a find hit (record index, list column).
+  std::function<void(int record, int column)> showHit;
+  // A database already open at `path` (the view levels), or null.
+  std::function<Database*(const std::string& path)> findOpen;
+
+  void Changed() const {
+    if (viewChanged) viewChanged();
+  }
+};
+
+// A modal message box on the GUI thread, captions as the engine writes
+// them (8-bit text).
+void ShowBox(QWidget* parent, const std::string& text, const std::string& caption, bool error);
+
+}  // namespace cx::gui

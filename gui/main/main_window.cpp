@@ -14,8 +14,8 @@
 #include <QVBoxLayout>
 #include <memory>
 
+#include "app/commands.h"
 #include "app/preferences.h"
-#include "design/security.h"
 #include "gui/common/help.h"
 #include "gui/common/icons.h"
 #include "gui/common/qt_ui_port.h"
@@ -80,7 +80,6 @@ MainWindow::MainWindow(Workspace& workspace, QtUiPort& ui, QWidget* parent)
   BuildMenus();
   InstallEditorCommands(this, workspace_);
   BuildToolBar();
-  InstallHelpShortcut(this, QString::fromLatin1(kHelpContents));
 
   workspace_.AddListener(this);
   AttachShownDocument();
@@ -92,14 +91,37 @@ MainWindow::~MainWindow() {
   if (attached_) attached_->RemoveListener(this);
 }
 
-QAction* MainWindow::AddCommand(QMenu* menu, const QString& text, const QKeySequence& shortcut,
-                                void (MainWindow::*slot)()) {
-  QAction* action = menu->addAction(text);
-  action->setObjectName(text);
-  if (!shortcut.isEmpty()) action->setShortcut(shortcut);
-  connect(action, &QAction::triggered, this, slot);
-  actions_[text] = action;
-  return action;
+MainWindow::Slot MainWindow::SlotOf(Command command) {
+  switch (command) {
+    case Command::New: return &MainWindow::newDatabase;
+    case Command::Open: return &MainWindow::openDatabase;
+    case Command::MoreFiles: return &MainWindow::openDatabase;
+    case Command::Save: return &MainWindow::saveDatabase;
+    case Command::SaveAs: return &MainWindow::saveDatabaseAs;
+    case Command::Close: return &MainWindow::closeDatabase;
+    case Command::Preferences: return &MainWindow::editPreferences;
+    case Command::Exit: return &MainWindow::exitProgram;
+    case Command::NewRecord: return &MainWindow::newRecord;
+    case Command::Find: return &MainWindow::showFindDialog;
+    case Command::FindAgain: return &MainWindow::findAgain;
+    case Command::Filter: return &MainWindow::showFilterDialog;
+    case Command::Sort: return &MainWindow::showSortDialog;
+    case Command::DeleteRecords: return &MainWindow::deleteRecords;
+    case Command::MoveRecords: return &MainWindow::moveRecordsTo;
+    case Command::CopyRecords: return &MainWindow::copyRecordsTo;
+    case Command::ExportRecords: return &MainWindow::exportRecords;
+    case Command::ImportRecords: return &MainWindow::importRecords;
+    case Command::PrintRecords: return &MainWindow::printRecords;
+    case Command::DBProperties: return &MainWindow::showDbProperties;
+    case Command::RunReport: return &MainWindow::runReport;
+    case Command::Back: return &MainWindow::backToParent;
+    case Command::BeamRecords: return &MainWindow::beamRecords;
+    case Command::BeamDatabase: return &MainWindow::beamDatabase;
+    case Command::Receive: return &MainWindow::receiveViaInfrared;
+    case Command::Help: return &MainWindow::showHelpContents;
+    case Command::About: return &MainWindow::showAbout;
+  }
+  return nullptr;
 }
 
 QAction* MainWindow::action(const QString& text) const {
@@ -107,70 +129,53 @@ QAction* MainWindow::action(const QString& text) const {
   return it == actions_.end() ? nullptr : it->second;
 }
 
+QAction* MainWindow::action(Command command) const {
+  return commandActions_[static_cast<int>(command)];
+}
+
 void MainWindow::BuildMenus() {
-  QMenu* file = menuBar()->addMenu(QStringLiteral("&File"));
-  AddCommand(file, QStringLiteral("New"), QKeySequence::New, &MainWindow::newDatabase);
-  AddCommand(file, QStringLiteral("Open..."), QKeySequence::Open, &MainWindow::openDatabase);
-  reopenMenu_ = file->addMenu(QStringLiteral("Reopen"));
-  reopenMenu_->setObjectName(QStringLiteral("reopenMenu"));
-  connect(reopenMenu_, &QMenu::aboutToShow, this, &MainWindow::RebuildReopenMenu);
-  RebuildReopenMenu();
-  file->addSeparator();
-  saveAction_ = AddCommand(file, QStringLiteral("Save"), QKeySequence::Save, &MainWindow::saveDatabase);
-  needsOpen_.push_back(
-      AddCommand(file, QStringLiteral("Save As..."), QKeySequence::SaveAs, &MainWindow::saveDatabaseAs));
-  needsOpen_.push_back(AddCommand(file, QStringLiteral("Close"), QKeySequence::Close, &MainWindow::closeDatabase));
-  file->addSeparator();
-  AddCommand(file, QStringLiteral("Preferences..."), QKeySequence(), &MainWindow::editPreferences);
-  file->addSeparator();
-  AddCommand(file, QStringLiteral("Exit"), QKeySequence::Quit, &MainWindow::exitProgram);
+  const std::pair<MenuGroup, QString> groups[] = {
+      {MenuGroup::File, QStringLiteral("&File")},         {MenuGroup::Records, QStringLiteral("&Records")},
+      {MenuGroup::Database, QStringLiteral("&Database")}, {MenuGroup::Beam, QStringLiteral("&Beam")},
+      {MenuGroup::Help, QStringLiteral("&Help")},
+  };
+  std::map<MenuGroup, QMenu*> menus;
+  for (const auto& [group, title] : groups) menus[group] = menuBar()->addMenu(title);
 
-  QMenu* records = menuBar()->addMenu(QStringLiteral("&Records"));
-  newRecordAction_ = AddCommand(records, QStringLiteral("New Record"), QKeySequence(Qt::CTRL | Qt::SHIFT | Qt::Key_N),
-                                &MainWindow::newRecord);
-  newRecordAction_->setIcon(NewRecordIcon());
-  newRecordAction_->setObjectName(QStringLiteral("newRecordAction"));
-  records->addSeparator();
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Find..."), QKeySequence::Find, &MainWindow::showFindDialog));
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Find Again"), QKeySequence(Qt::Key_F3), &MainWindow::findAgain));
-  records->addSeparator();
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Sort..."), QKeySequence(), &MainWindow::showSortDialog));
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Filter..."), QKeySequence(), &MainWindow::showFilterDialog));
-  records->addSeparator();
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Run Report..."), QKeySequence(), &MainWindow::runReport));
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Print Records..."), QKeySequence::Print, &MainWindow::printRecords));
-  records->addSeparator();
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Move Records To..."), QKeySequence(), &MainWindow::moveRecordsTo));
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Copy Records To..."), QKeySequence(), &MainWindow::copyRecordsTo));
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Export Records..."), QKeySequence(), &MainWindow::exportRecords));
-  needsOpen_.push_back(AddCommand(records, QStringLiteral("Import Records..."), QKeySequence(), &MainWindow::importRecords));
-  records->addSeparator();
-  needsOpen_.push_back(
-      AddCommand(records, QStringLiteral("Delete Records..."), QKeySequence::Delete, &MainWindow::deleteRecords));
-
-  QMenu* database = menuBar()->addMenu(QStringLiteral("&Database"));
-  needsOpen_.push_back(
-      AddCommand(database, QStringLiteral("DB Properties..."), QKeySequence(), &MainWindow::dbPropertiesCommand));
-
-  QMenu* beam = menuBar()->addMenu(QStringLiteral("&Beam"));
-  needsOpen_.push_back(AddCommand(beam, QStringLiteral("Beam Records..."), QKeySequence(), &MainWindow::beamRecordsCommand));
-  needsOpen_.push_back(AddCommand(beam, QStringLiteral("Beam Database..."), QKeySequence(), &MainWindow::beamDatabaseCommand));
-  beam->addSeparator();
-  AddCommand(beam, QStringLiteral("Receive Via Infrared..."), QKeySequence(), &MainWindow::receiveViaInfrared);
-
-  QMenu* help = menuBar()->addMenu(QStringLiteral("&Help"));
-  QAction* contents = AddCommand(help, QStringLiteral("Cardovex Help"), QKeySequence(), &MainWindow::showHelpContents);
-  contents->setShortcut(QKeySequence::HelpContents);
-  // The window's own F1 shortcut serves the key; the menu shows it.
-  contents->setShortcutContext(Qt::WidgetShortcut);
-  help->addSeparator();
-  AddCommand(help, QStringLiteral("About"), QKeySequence(), &MainWindow::showAbout);
-
-  // Menu entries are greyed when their menu opens and after every change;
-  // the refresh on opening catches anything the other refreshes missed.
-  for (QMenu* menu : {file, records, database, beam}) {
-    connect(menu, &QMenu::aboutToShow, this, &MainWindow::UpdateCommandState);
+  for (const CommandInfo& info : CommandTable()) {
+    const QString text = QString::fromLatin1(info.text);
+    auto* act = new QAction(text, this);
+    act->setObjectName(text);
+    if (*info.shortcut) act->setShortcut(QKeySequence(QString::fromLatin1(info.shortcut), QKeySequence::PortableText));
+    connect(act, &QAction::triggered, this, SlotOf(info.id));
+    commandActions_[static_cast<int>(info.id)] = act;
+    actions_[text] = act;
+    // "More Files..." closes the Reopen submenu, which is built each time it
+    // opens.
+    if (info.id == Command::MoreFiles) continue;
+    QMenu* menu = menus[info.menu];
+    if (info.separatorBefore && !menu->isEmpty()) menu->addSeparator();
+    menu->addAction(act);
+    if (info.id == Command::Open) {
+      reopenMenu_ = menu->addMenu(QStringLiteral("Reopen"));
+      reopenMenu_->setObjectName(QStringLiteral("reopenMenu"));
+      connect(reopenMenu_, &QMenu::aboutToShow, this, &MainWindow::RebuildReopenMenu);
+    }
   }
+  RebuildReopenMenu();
+
+  newRecordAction_ = action(Command::NewRecord);
+  newRecordAction_->setIcon(NewRecordIcon());
+  // The desktop's usual key for a new item, beside the table's own.
+  newRecordAction_->setShortcuts({newRecordAction_->shortcut(), QKeySequence(Qt::CTRL | Qt::SHIFT | Qt::Key_N)});
+  backAction_ = action(Command::Back);
+  backAction_->setIcon(BackIcon());
+  backAction_->setIconText(QStringLiteral("Back"));
+  saveAction_ = action(Command::Save);
+
+  // Entries are greyed after every change; the refresh when a menu opens
+  // catches anything those missed.
+  for (const auto& [group, menu] : menus) connect(menu, &QMenu::aboutToShow, this, &MainWindow::UpdateCommandState);
 }
 
 void MainWindow::BuildToolBar() {
@@ -179,11 +184,6 @@ void MainWindow::BuildToolBar() {
   bar->setMovable(false);
   bar->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
   bar->addAction(newRecordAction_);
-  backAction_ = new QAction(BackIcon(), QStringLiteral("Back"), this);
-  backAction_->setObjectName(QStringLiteral("backAction"));
-  backAction_->setToolTip(QStringLiteral("Back to the database this one was opened from"));
-  backAction_->setShortcut(QKeySequence(Qt::ALT | Qt::Key_Left));
-  connect(backAction_, &QAction::triggered, this, &MainWindow::backToParent);
   bar->addAction(backAction_);
 }
 
@@ -196,18 +196,14 @@ void MainWindow::RebuildReopenMenu() {
     connect(a, &QAction::triggered, this, [this, n] { reopenDatabase(n); });
   }
   reopenMenu_->addSeparator();
-  QAction* more = reopenMenu_->addAction(QStringLiteral("More Files..."));
-  more->setObjectName(QStringLiteral("More Files..."));
-  connect(more, &QAction::triggered, this, &MainWindow::openDatabase);
+  reopenMenu_->addAction(action(Command::MoreFiles));
 }
 
 void MainWindow::UpdateCommandState() {
-  const Document* doc = workspace_.shown();
-  const bool open = doc != nullptr;
-  for (QAction* a : needsOpen_) a->setEnabled(open);
-  saveAction_->setEnabled(open && doc->changed());
-  newRecordAction_->setEnabled(open);
-  backAction_->setEnabled(workspace_.level() > 0);
+  const MenuState state = MenuStateFor(workspace_);
+  for (int c = 0; c < kCommandCount; ++c) {
+    if (QAction* act = commandActions_[c]) act->setEnabled(state.enabled[c]);
+  }
   UpdateLabels();
 }
 
@@ -404,11 +400,6 @@ void MainWindow::ShowStartDialog() {
 
 // --- Commands of the list ------------------------------------------------------
 
-bool MainWindow::Allowed(int operation) {
-  Document* doc = document();
-  return doc && cx::Allowed(CheckAccess(doc->db(), operation, ui_));
-}
-
 void MainWindow::findAgain() {
   Document* doc = document();
   if (!doc) return;
@@ -421,7 +412,8 @@ void MainWindow::findAgain() {
 }
 
 void MainWindow::deleteRecords() {
-  if (!Allowed(secured::kDeleteRecords)) return;
+  Document* doc = document();
+  if (!doc || !CommandAllowed(Command::DeleteRecords, *doc, ui_)) return;
   DeleteRecordsDialog dialog(this);
   if (dialog.exec() != QDialog::Accepted) return;
   WaitCursor wait;
@@ -451,21 +443,21 @@ void MainWindow::showHeadingMenu(int column) {
   // The menu answers at once; the command runs after it has gone.
   const int entry = chosen ? menu->actions().indexOf(chosen) : -1;
   menu.reset();
-  switch (entry) {
-    case 0: sortFromHeading(field, true); break;
-    case 1: sortFromHeading(field, false); break;
-    case 2: fieldPropertiesCommand(field); break;
-    case 3: headingReportCommand(field); break;
-    case 4: hideField(field); break;
-    default: break;
+  if (entry < 0) return;
+  switch (HeadingMenu()[entry].id) {
+    case HeadingCommand::SortForward: sortFromHeading(field, true); break;
+    case HeadingCommand::SortReverse: sortFromHeading(field, false); break;
+    case HeadingCommand::FieldProperties: showFieldProperties(field); break;
+    case HeadingCommand::RunReport: headingReportCommand(field); break;
+    case HeadingCommand::HideField: hideField(field); break;
   }
 }
 
 QMenu* MainWindow::CreateHeadingMenu(QWidget* parent) {
   auto* menu = new QMenu(parent);
   menu->setObjectName(QStringLiteral("headingMenu"));
-  for (const char* text : {"Sort Forward", "Sort Reverse", "Field Properties", "Run Report", "Hide Field"}) {
-    menu->addAction(QString::fromLatin1(text))->setObjectName(QString::fromLatin1(text));
+  for (const HeadingEntry& entry : HeadingMenu()) {
+    menu->addAction(QString::fromLatin1(entry.text))->setObjectName(QString::fromLatin1(entry.text));
   }
   return menu;
 }
@@ -481,31 +473,10 @@ void MainWindow::hideField(int field) {
   if (Document* doc = document()) doc->HideField(field);
 }
 
-void MainWindow::fieldPropertiesCommand(int field) {
-  // The heading is a second way into the design: it is guarded the same.
-  if (!Allowed(secured::kDBProperties)) return;
-  showFieldProperties(field);
-}
-
 void MainWindow::headingReportCommand(int field) {
   Document* doc = document();
   if (!doc || !doc->CanRunReport(field)) return;
   runHeadingReport(field);
-}
-
-void MainWindow::dbPropertiesCommand() {
-  if (!Allowed(secured::kDBProperties)) return;
-  showDbProperties();
-}
-
-void MainWindow::beamRecordsCommand() {
-  if (!Allowed(secured::kBeamData)) return;
-  beamRecords();
-}
-
-void MainWindow::beamDatabaseCommand() {
-  if (!Allowed(secured::kBeamData)) return;
-  beamDatabase();
 }
 
 void MainWindow::columnWidthChosen(int column, int pixels) {
@@ -540,10 +511,10 @@ QDialog* MainWindow::CreateAboutBox(QWidget* parent) {
   box->setTextFormat(Qt::RichText);
   box->setText(QStringLiteral("<h3>Cardovex %1</h3>").arg(QString::fromLatin1(CARDOVEX_VERSION)));
   box->setInformativeText(
-      QStringLiteral("A personal database manager for small databases of typed fields.<br>"
-                     "Reads and writes database files of version %1.<br><br>"
-                     "Built with Qt %2.")
-          .arg(QString::fromLatin1(ProgramVersion()), QString::fromLatin1(qVersion())));
+      QStringLiteral("A personal database manager for small databases of typed fields, "
+                     "one database per file.<br><br>"
+                     "Built with Qt %1.")
+          .arg(QString::fromLatin1(qVersion())));
   box->setStandardButtons(QMessageBox::Ok);
   return box;
 }

@@ -5,9 +5,9 @@
 //
 // For the dialog modules: workspace(), context(), document() and
 // RebuildList() are what a command needs. Each command of a module has one
-// private slot below whose body calls into that module. Where a command is
-// guarded (DB Properties, Field Properties, Beam), the access check has been
-// asked before the slot is called: the slot only does the work.
+// private slot below whose body calls into that module; the module asks the
+// command's access check itself (the menus and keys only grey what cannot
+// apply).
 #pragma once
 
 #include <QMainWindow>
@@ -15,6 +15,7 @@
 #include <array>
 #include <map>
 
+#include "app/commands.h"
 #include "app/document.h"
 
 class QAction;
@@ -47,8 +48,9 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
 
   RecordListView* list() const { return list_; }
   RecordListModel* model() const { return model_; }
-  // The action of a menu command by its text (tests and screenshots).
+  // The action of a menu command, by its text or its id.
   QAction* action(const QString& text) const;
+  QAction* action(Command command) const;
 
   // The start dialog, as after "Close": new, open or nothing.
   void ShowStartDialog();
@@ -78,12 +80,7 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   void showHeadingMenu(int column);
   void sortFromHeading(int field, bool forward);
   void hideField(int field);
-  void fieldPropertiesCommand(int field);
   void headingReportCommand(int field);
-  // Guarded commands: the access check, then the module's slot.
-  void dbPropertiesCommand();
-  void beamRecordsCommand();
-  void beamDatabaseCommand();
   // The list.
   void cellTapped(int row, int column);
   void columnWidthChosen(int column, int pixels);
@@ -136,10 +133,10 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   void CurrentRecordChanged(size_t recordIndex) override;
   void FoundRecordChanged() override;
 
+  using Slot = void (MainWindow::*)();
+  static Slot SlotOf(Command command);
   void BuildMenus();
   void BuildToolBar();
-  QAction* AddCommand(QMenu* menu, const QString& text, const QKeySequence& shortcut,
-                      void (MainWindow::*slot)());
   void RebuildReopenMenu();
   void AttachShownDocument();
   void UpdateLabels();
@@ -147,7 +144,6 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   // Runs a command only when a database is open (shortcuts reach commands
   // whose menu entry is greyed only if they are not disabled in time).
   bool RequireOpen() const { return workspace_.shown() != nullptr; }
-  bool Allowed(int operation);
   void NotAvailableYet(const QString& command);
   void OpenPath(const std::string& path);
   void RunStartChoice();
@@ -163,8 +159,7 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   QAction* newRecordAction_ = nullptr;
   QAction* backAction_ = nullptr;
   QAction* saveAction_ = nullptr;
-  // Enabled exactly while a database is open.
-  std::vector<QAction*> needsOpen_;
+  std::array<QAction*, kCommandCount> commandActions_{};
   std::map<QString, QAction*> actions_;
   bool selecting_ = false;
 };

@@ -2,6 +2,7 @@
 
 #include "design/security.h"
 #include "ops/calc.h"
+#include "ops/compare.h"
 #include "ops/field_values.h"
 #include "ops/links.h"
 #include "ops/sort.h"
@@ -31,6 +32,18 @@ size_t Relocate(const Database& db, const Bytes& expected, size_t index) {
   }
   const long found = FindRecord(db, expected, index);
   return found >= 0 ? static_cast<size_t>(found) : index;
+}
+
+// The sorted place of a record just changed. Most edits leave a record
+// between the same neighbours: that is checked first, so that the common
+// case does not walk the table (the walk finds the same place).
+size_t PlaceRecord(Database& db, size_t index) {
+  const size_t count = db.recordCount();
+  ByteView record = db.record(index);
+  const bool afterPrevious = index == 0 || ComparePlacement(db, record, db.record(index - 1)) >= 0;
+  const bool beforeNext = index + 1 >= count || ComparePlacement(db, record, db.record(index + 1)) < 0;
+  if (afterPrevious && beforeNext && !record.empty()) return index;
+  return RepositionRecord(db, index);
 }
 
 void Finish(DataSession& session) {
@@ -73,7 +86,7 @@ StoreOutcome StoreRecord(DataSession& session, size_t index, Bytes stored,
   }
   if (HasCalculatedField(db.schema())) RecalculateRecord(session, index);
   const size_t oldIndex = index;
-  if (!inPlace) index = RepositionRecord(db, index);
+  if (!inPlace) index = PlaceRecord(db, index);
   ByteView placed = db.record(index);
   Bytes expected(placed.begin(), placed.end());
   RecalculateAfterMove(session, adding ? oldIndex : step.beforeIndex, index);

@@ -87,12 +87,6 @@ TEST_F(RecentFilesTest, TheEleventhDropsTheOldest) {
   for (const auto& p : All()) EXPECT_NE(p, "/f/9.PDB");
 }
 
-TEST_F(RecentFilesTest, AFirstAddWritesAllTenValues) {
-  recent.Add("/f/a.PDB");
-  EXPECT_EQ(settings.Get("LastFile0"), std::string("/f/a.PDB"));
-  EXPECT_EQ(settings.Get("LastFile9"), std::string(""));
-}
-
 TEST_F(RecentFilesTest, StartListAndReopenEntriesWithAMissingFile) {
   const std::string a = WritePeople("Alpha");
   const std::string b = WritePeople("Beta");

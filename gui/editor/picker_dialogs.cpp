@@ -8,32 +8,44 @@
 #include <QPushButton>
 #include <QTimeEdit>
 #include <QVBoxLayout>
+#include <memory>
 
 #include "gui/common/help.h"
 #include "gui/common/text.h"
 
 namespace cx::gui {
 
-int ExecDateMenu(QWidget* parent, const QPoint& at, bool offerChooseDate) {
-  QMenu menu(parent);
-  menu.setObjectName(QStringLiteral("dateMenu"));
+QMenu* CreateDateMenu(QWidget* parent, bool offerChooseDate) {
+  auto* menu = new QMenu(parent);
+  menu->setObjectName(QStringLiteral("dateMenu"));
   const std::vector<std::string> entries = DateMenuEntries(offerChooseDate);
   for (size_t i = 0; i < entries.size(); ++i) {
-    menu.addAction(QString::fromLatin1(entries[i].c_str()))->setData(static_cast<int>(i));
+    menu->addAction(QString::fromLatin1(entries[i].c_str()))->setData(static_cast<int>(i));
   }
-  QAction* chosen = menu.exec(at);
+  return menu;
+}
+
+QMenu* CreatePopupMenu(QWidget* parent, const std::vector<PopupMenuEntry>& entries) {
+  auto* menu = new QMenu(parent);
+  menu->setObjectName(QStringLiteral("popupValueMenu"));
+  for (const PopupMenuEntry& e : entries) {
+    if (e.id == picker_ids::kNoValue || e.id == picker_ids::kEditPopupList) menu->addSeparator();
+    menu->addAction(EscapeMnemonic(FromDb(e.text)))->setData(e.id);
+  }
+  return menu;
+}
+
+int ExecDateMenu(QWidget* parent, const QPoint& at, bool offerChooseDate) {
+  std::unique_ptr<QMenu> menu(CreateDateMenu(parent, offerChooseDate));
+  QAction* chosen = menu->exec(at);
   return chosen ? chosen->data().toInt() : kDateDismissed;
 }
 
 int ExecPopupMenu(QWidget* parent, const QPoint& at, const Database& db, int field, bool offerNoValue,
                   bool offerEditList) {
   const std::vector<PopupMenuEntry> entries = PopupMenuEntries(db, field, offerNoValue, offerEditList);
-  QMenu menu(parent);
-  menu.setObjectName(QStringLiteral("popupValueMenu"));
-  for (const PopupMenuEntry& e : entries) {
-    menu.addAction(EscapeMnemonic(FromDb(e.text)))->setData(e.id);
-  }
-  QAction* chosen = menu.exec(at);
+  std::unique_ptr<QMenu> menu(CreatePopupMenu(parent, entries));
+  QAction* chosen = menu->exec(at);
   return PopupResultForEntry(db, field, entries, chosen ? chosen->data().toInt() : 0);
 }
 

@@ -10,9 +10,15 @@
 #include "app/pickers.h"
 
 class QCalendarWidget;
+class QMenu;
 class QTimeEdit;
 
 namespace cx::gui {
+
+// The two menus, each entry carrying its result (date menu) or entry id
+// (popup value menu) as data.
+QMenu* CreateDateMenu(QWidget* parent, bool offerChooseDate);
+QMenu* CreatePopupMenu(QWidget* parent, const std::vector<PopupMenuEntry>& entries);
 
 // The date menu at `at` (global position): a DateMenuResult.
 int ExecDateMenu(QWidget* parent, const QPoint& at, bool offerChooseDate);

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <random>
 
 #include "design/security.h"
 #include "ops/calc.h"
@@ -129,6 +130,37 @@ TEST(StoreRecord, AFullDatabaseRefusesTheNewRecord) {
   ASSERT_EQ(t.ui.messages.size(), 1u);
   EXPECT_EQ(t.ui.messages[0].text, "ERROR: Saving record!");
   EXPECT_EQ(t.db.recordCount(), static_cast<size_t>(format::kMaxDataRecords));
+}
+
+TEST(StoreRecord, PlacesRecordsWhereTheTableWalkWouldAmongEqualKeys) {
+  TestDb t;
+  const int name = t.Field(T::Text, "Name");
+  const int n = t.Field(T::Integer, "N");
+  t.db.schema().sortKey[0] = {static_cast<uint8_t>(name), 0};
+  std::mt19937 rng(7);
+  const char* names[] = {"a", "b", "b", "c", "d"};
+  for (int i = 0; i < 60; ++i) t.Add({Text(name, names[rng() % 5]), Num(n, static_cast<uint32_t>(i))});
+  SortAll(t.db);
+  for (int step = 0; step < 200; ++step) {
+    Database walked = t.db;
+    const size_t index = rng() % t.db.recordCount();
+    const std::string to = names[rng() % 5];
+    RecordForm form(t.session, index, kClock);
+    form.SetText(name, to);
+    const Bytes stored = [&] {
+      RecordForm copy(t.session, index, kClock);
+      copy.SetText(name, to);
+      return copy.Stored();
+    }();
+    const StoreOutcome out = CommitForm(form, nullptr);
+    ASSERT_TRUE(out.ok);
+    walked.ReplaceRecord(index, stored);
+    const size_t expected = form.Modified(name) ? RepositionRecord(walked, index) : index;
+    ASSERT_EQ(out.index, expected) << "step " << step;
+    for (size_t r = 0; r < t.db.recordCount(); ++r) {
+      ASSERT_TRUE(std::ranges::equal(t.db.record(r), walked.record(r))) << "step " << step;
+    }
+  }
 }
 
 TEST(RecordHistory, UndoAndRedoEveryKindOfChange) {

@@ -39,6 +39,7 @@ void Rebuild(const DataTarget& t) {
 }
 
 LinkServices Services(const DataTarget& t) {
+  if (t.linkServices) return t.linkServices();
   return SecuredLinkServices(t.session.ui, &t.session.locale, t.findOpen);
 }
 
@@ -79,9 +80,9 @@ int SearchDatabaseCommand(QWidget* parent, const DataTarget& t) {
   int index;
   {
     WaitCursor wait;
-    index = SearchDatabase(t.session, dialog.settings());
+    index = t.find ? t.find(dialog.settings()) : SearchDatabase(t.session, dialog.settings());
   }
-  ShowHit(t, index);
+  if (!t.find) ShowHit(t, index);
   return index;
 }
 

@@ -12,6 +12,11 @@
 
 class QWidget;
 
+namespace cx {
+class Document;
+struct AppContext;
+}  // namespace cx
+
 namespace cx::gui {
 
 class BeamSession;
@@ -52,5 +57,12 @@ BeamSession* BeamCommand(QWidget* parent, const DataTarget& target, Settings& se
 // "Receive...": the receive window (one per parent; shown again when open).
 ReceiveWindow* ReceiveCommand(QWidget* parent, Settings& settings, const std::string& dataFolder, UiPort& ui,
                               std::function<DataSession*()> shown, std::function<void()> viewChanged);
+
+// The same commands on a document of the main window: the view follows
+// through the document's listeners.
+DataTarget TargetFor(cx::Document& doc);
+// "Receive Via Infrared..." for the main window: the database on screen
+// is asked of `shown` each time something arrives.
+ReceiveWindow* ReceiveForWindow(QWidget* window, cx::AppContext& context, std::function<cx::Document*()> shown);
 
 }  // namespace cx::gui

@@ -8,9 +8,6 @@
 
 namespace cx::gui {
 
-WaitCursor::WaitCursor() { QGuiApplication::setOverrideCursor(Qt::WaitCursor); }
-WaitCursor::~WaitCursor() { QGuiApplication::restoreOverrideCursor(); }
-
 QString DesktopFileFilter(const std::string& handheldFilter) {
   const QStringList parts = QString::fromStdString(handheldFilter).split('|', Qt::SkipEmptyParts);
   QStringList out;

@@ -1,4 +1,4 @@
-// Small pieces the data dialogs share: the wait cursor, file-type lists in
+// Small pieces the data dialogs share: file-type lists in
 // the desktop's form, and the target of a command (the open database and
 // what to tell when its view changed).
 #pragma once
@@ -8,20 +8,14 @@
 #include <functional>
 #include <string>
 
+#include "gui/common/qt_ui_port.h"  // WaitCursor
+#include "ops/database_settings.h"
+#include "ops/links.h"
 #include "ops/session.h"
 
 class QWidget;
 
 namespace cx::gui {
-
-// Balanced with the constructor however the scope is left.
-class WaitCursor {
- public:
-  WaitCursor();
-  ~WaitCursor();
-  WaitCursor(const WaitCursor&) = delete;
-  WaitCursor& operator=(const WaitCursor&) = delete;
-};
 
 // "Text Files (*.txt)|*.txt|All Files (*.*)|*.*||" as a file dialog's
 // filter ("Text Files (*.txt);;All Files (*)"); extensions match either case.
@@ -44,6 +38,12 @@ struct DataTarget {
   std::function<void(int record, int column)> showHit;
   // A database already open at `path` (the view levels), or null.
   std::function<Database*(const std::string& path)> findOpen;
+  // The link services of the document, when it has its own (they know the
+  // databases open at other levels); otherwise made from `findOpen`.
+  std::function<LinkServices()> linkServices;
+  // Runs a search through the document, which selects the hit; without
+  // it the search runs on the session and `showHit` is told.
+  std::function<int(const SearchSettings&)> find;
 
   void Changed() const {
     if (viewChanged) viewChanged();

@@ -20,12 +20,14 @@
 #include "gui/common/icons.h"
 #include "gui/common/qt_ui_port.h"
 #include "gui/common/text.h"
+#include "gui/data/data_commands.h"
 #include "gui/editor/editor_commands.h"
 #include "gui/main/delete_records_dialog.h"
 #include "gui/main/preferences_dialog.h"
 #include "gui/main/record_list_model.h"
 #include "gui/main/record_list_view.h"
 #include "gui/main/start_dialog.h"
+#include "platform/qt/qt_platform.h"
 
 namespace cx::gui {
 
@@ -541,18 +543,46 @@ void MainWindow::resumeAfterLinkedLevel() {
 }
 void MainWindow::showDbProperties() { NotAvailableYet(QStringLiteral("DB Properties...")); }
 void MainWindow::showFieldProperties(int) { NotAvailableYet(QStringLiteral("Field Properties")); }
-void MainWindow::showSortDialog() { NotAvailableYet(QStringLiteral("Sort...")); }
-void MainWindow::showFilterDialog() { NotAvailableYet(QStringLiteral("Filter...")); }
-void MainWindow::showFindDialog() { NotAvailableYet(QStringLiteral("Find...")); }
-void MainWindow::runReport() { NotAvailableYet(QStringLiteral("Run Report...")); }
-void MainWindow::runHeadingReport(int) { NotAvailableYet(QStringLiteral("Run Report")); }
-void MainWindow::exportRecords() { NotAvailableYet(QStringLiteral("Export Records...")); }
-void MainWindow::importRecords() { NotAvailableYet(QStringLiteral("Import Records...")); }
-void MainWindow::moveRecordsTo() { NotAvailableYet(QStringLiteral("Move Records To...")); }
-void MainWindow::copyRecordsTo() { NotAvailableYet(QStringLiteral("Copy Records To...")); }
-void MainWindow::printRecords() { NotAvailableYet(QStringLiteral("Print Records...")); }
-void MainWindow::beamRecords() { NotAvailableYet(QStringLiteral("Beam Records...")); }
-void MainWindow::beamDatabase() { NotAvailableYet(QStringLiteral("Beam Database...")); }
-void MainWindow::receiveViaInfrared() { NotAvailableYet(QStringLiteral("Receive Via Infrared...")); }
+void MainWindow::showSortDialog() {
+  if (Document* doc = document()) SortRecordsCommand(this, TargetFor(*doc));
+}
+void MainWindow::showFilterDialog() {
+  if (Document* doc = document()) EditFiltersCommand(this, TargetFor(*doc));
+}
+void MainWindow::showFindDialog() {
+  if (Document* doc = document()) SearchDatabaseCommand(this, TargetFor(*doc));
+}
+void MainWindow::runReport() {
+  if (Document* doc = document()) RunReportCommand(this, TargetFor(*doc));
+}
+void MainWindow::runHeadingReport(int field) {
+  if (Document* doc = document()) RunReportCommand(this, TargetFor(*doc), field);
+}
+void MainWindow::exportRecords() {
+  if (Document* doc = document()) ExportCsvCommand(this, TargetFor(*doc));
+}
+void MainWindow::importRecords() {
+  if (Document* doc = document()) ImportCsvCommand(this, TargetFor(*doc));
+}
+void MainWindow::moveRecordsTo() {
+  if (Document* doc = document()) TransferCommand(this, TargetFor(*doc), /*move=*/true, /*all=*/true);
+}
+void MainWindow::copyRecordsTo() {
+  if (Document* doc = document()) TransferCommand(this, TargetFor(*doc), /*move=*/false, /*all=*/true);
+}
+void MainWindow::printRecords() {
+  if (Document* doc = document()) PrintCommand(this, TargetFor(*doc), /*all=*/true);
+}
+void MainWindow::beamRecords() {
+  auto settings = OpenDesktopSettings();
+  if (Document* doc = document()) BeamCommand(this, TargetFor(*doc), *settings, obex::BeamWhat::kRecordsInView);
+}
+void MainWindow::beamDatabase() {
+  auto settings = OpenDesktopSettings();
+  if (Document* doc = document()) BeamCommand(this, TargetFor(*doc), *settings, obex::BeamWhat::kDatabase);
+}
+void MainWindow::receiveViaInfrared() {
+  ReceiveForWindow(this, context(), [this] { return document(); });
+}
 
 }  // namespace cx::gui

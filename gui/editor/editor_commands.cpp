@@ -8,6 +8,7 @@
 #include "app/preferences.h"
 #include "app/record_commit.h"
 #include "design/security.h"
+#include "engine/database_folder.h"
 #include "engine/value_text.h"
 #include "gui/common/qt_ui_port.h"
 #include "gui/editor/picker_dialogs.h"
@@ -201,6 +202,16 @@ void EditorCommands::RunEditor(size_t record, bool viewOnly, std::optional<size_
 bool EditorCommands::Follow(Document& doc, size_t record, int field) {
   if (record >= doc.db().recordCount() || field < 0 || field >= format::kFieldCount) return false;
   const FieldDef& def = doc.db().schema().field[field];
+  std::string otherPath = def.text.str();
+  if (!FindDatabaseBeside(otherPath, doc.db().path())) {
+    doc.session().ui.ShowMessage(record_messages::kLinkedNotPresent, "ERROR", MessageIcon::Error);
+    return false;
+  }
+  if (workspace_.levels().AtTop()) {
+    doc.session().ui.ShowMessage("All 20 levels of linked databases are in use: close one first.", "ERROR",
+                                 MessageIcon::Error);
+    return false;
+  }
   LinkServices services = workspace_.MakeLinkServices();
   LinkedDatabase linked = OpenLinkedDatabase(field, doc.db(), record, LinkAccess::Open, services);
   if (!linked) return false;

@@ -139,6 +139,7 @@ class EditorTest : public QObject {
   void addedRecordLandsSortedWithItsCalculations();
   void linkLevelsAndBack();
   void dbPopupChoosesFromTheOtherDatabase();
+  void missingLinkedDatabaseSaysSoAndReturns();
   void viewOnlyRefusesEdits();
   void pageDownKeepsTheEditsAndMovesOn();
   void imageEditorKeepsUntouchedPicturesAndDraws();
@@ -343,6 +344,31 @@ void EditorTest::dbPopupChoosesFromTheOtherDatabase() {
   QCOMPARE(desk.workspace->level(), 0);
   QCOMPARE(shown, FromDb(chosen));
   QCOMPARE(ValueString(desk.Value(desk.doc().currentRecord(), shipTo)), chosen);
+}
+
+void EditorTest::missingLinkedDatabaseSaysSoAndReturns() {
+  Desk desk;
+  QVERIFY(QFile::remove(QString::fromStdString(desk.Path("Orders"))));
+  QVERIFY(desk.Open("Contacts"));
+  const int orders = desk.FieldNamed("Orders");
+  int editors = 0;
+  std::function<void(QWidget*)> press = [&](QWidget* w) {
+    ++editors;
+    w->findChild<QPushButton*>(QStringLiteral("link_") + QString::number(orders))->click();
+  };
+  WhenShown(QStringLiteral("recordEditor"), press);
+  // The editor comes back after the message; then it is closed.
+  QTimer::singleShot(300, [&] {
+    WhenShown(QStringLiteral("recordEditor"), [&](QWidget* w) {
+      ++editors;
+      static_cast<QDialog*>(w)->reject();
+    });
+  });
+  desk.commands->OpenRecordAt(0, desk.ColumnOf("Name"), QPoint());
+  QCOMPARE(editors, 2);
+  QCOMPARE(desk.workspace->level(), 0);
+  QVERIFY(!desk.ui.messages.empty());
+  QCOMPARE(desk.ui.messages.back().text, std::string("Linked Database is not present on this device!"));
 }
 
 void EditorTest::viewOnlyRefusesEdits() {

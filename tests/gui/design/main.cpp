@@ -1,0 +1,20 @@
+// One program for the design dialogs' widget tests.
+#include <QApplication>
+
+int RunFieldEditorDialogTest(int argc, char** argv);
+int RunDatabaseDialogsTest(int argc, char** argv);
+int RunCliEquivalenceTest(int argc, char** argv);
+int RunNewDatabaseDesignTest(int argc, char** argv);
+int RunAccessWalkTest(int argc, char** argv);
+
+int main(int argc, char** argv) {
+  if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM")) qputenv("QT_QPA_PLATFORM", "offscreen");
+  QApplication app(argc, argv);
+  int failed = 0;
+  failed += RunFieldEditorDialogTest(argc, argv);
+  failed += RunDatabaseDialogsTest(argc, argv);
+  failed += RunCliEquivalenceTest(argc, argv);
+  failed += RunNewDatabaseDesignTest(argc, argv);
+  failed += RunAccessWalkTest(argc, argv);
+  return failed == 0 ? 0 : 1;
+}

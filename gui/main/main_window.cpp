@@ -21,6 +21,7 @@
 #include "gui/common/qt_ui_port.h"
 #include "gui/common/text.h"
 #include "gui/data/data_commands.h"
+#include "gui/design/design_commands.h"
 #include "gui/editor/editor_commands.h"
 #include "gui/main/delete_records_dialog.h"
 #include "gui/main/preferences_dialog.h"
@@ -314,9 +315,13 @@ void MainWindow::newDatabase() {
   if (!workspace_.New()) return;
   AttachShownDocument();
   // A new database is defined in the properties dialog before anything
-  // else happens to it.
-  showDbProperties();
+  // else happens to it; abandoning that leaves no file and nothing open.
+  if (!DesignNewDatabase(this, *workspace_.shown())) {
+    workspace_.shown()->db().ClearChanged();
+    workspace_.Close();
+  }
   RebuildList();
+  UpdateCommandState();
 }
 
 void MainWindow::openDatabase() {
@@ -541,8 +546,14 @@ void MainWindow::resumeAfterLinkedLevel() {
   EditorCommandsOf(this, workspace_).ResumeAfterLinkedLevel();
   UpdateCommandState();
 }
-void MainWindow::showDbProperties() { NotAvailableYet(QStringLiteral("DB Properties...")); }
-void MainWindow::showFieldProperties(int) { NotAvailableYet(QStringLiteral("Field Properties")); }
+void MainWindow::showDbProperties() {
+  if (Document* doc = document()) ShowDatabaseProperties(this, *doc);
+  UpdateCommandState();
+}
+void MainWindow::showFieldProperties(int field) {
+  if (Document* doc = document()) ShowFieldProperties(this, *doc, field);
+  UpdateCommandState();
+}
 void MainWindow::showSortDialog() {
   if (Document* doc = document()) SortRecordsCommand(this, TargetFor(*doc));
 }

@@ -16,7 +16,7 @@ namespace {
 
 void EditorShot(ShotContext& shots, Document& doc, size_t record, bool viewOnly, const QString& name) {
   RecordEditorDialog editor(doc, record, viewOnly, nullptr, &shots.window());
-  editor.resize(540, 620);
+  editor.resize(540, editor.height());
   shots.Save(&editor, name);
   editor.hide();
 }

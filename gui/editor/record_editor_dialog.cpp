@@ -57,6 +57,14 @@ std::optional<std::string> FromEditBox(const QString& text, bool multiLine) {
 
 QString FieldName(const FieldDef& f) { return FromDb(f.name.str()); }
 
+// A box that only shows its value looks like one: the window's colour
+// behind the text instead of the colour of a box to type in.
+void LookReadOnly(QWidget* box) {
+  QPalette p = box->palette();
+  p.setColor(QPalette::Base, p.color(QPalette::Window));
+  box->setPalette(p);
+}
+
 }  // namespace
 
 RecordEditorDialog::RecordEditorDialog(Document& doc, size_t record, bool viewOnly,
@@ -70,6 +78,8 @@ RecordEditorDialog::RecordEditorDialog(Document& doc, size_t record, bool viewOn
   scroll_->setObjectName(QStringLiteral("recordScroll"));
   scroll_->setWidgetResizable(true);
   scroll_->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+  // The label column is a share of the width the rows really get.
+  scroll_->viewport()->installEventFilter(this);
   layout->addWidget(scroll_, 1);
 
   auto* buttons = new QDialogButtonBox(this);
@@ -100,8 +110,9 @@ RecordEditorDialog::RecordEditorDialog(Document& doc, size_t record, bool viewOn
   connect(next, &QShortcut::activated, this, [this] { Step(+1); });
   InstallHelpShortcut(this, QStringLiteral("Edit_Record"));
 
-  resize(560, 600);
   Load(record, copyFrom);
+  // Tall enough for the form, within reason; the form scrolls beyond.
+  resize(560, std::clamp(rows_->sizeHint().height() + 110, 260, 640));
 }
 
 RecordEditorDialog::~RecordEditorDialog() = default;
@@ -282,9 +293,11 @@ void RecordEditorDialog::AddRow(int field, int row) {
     }
     case FieldType::Date:
       control = MakeDateButton(field);
+      control->setMaximumWidth(220);
       break;
     case FieldType::Time:
       control = MakeTimeButton(field);
+      control->setMaximumWidth(220);
       break;
     case FieldType::Image:
       control = MakeImageButton(field);
@@ -327,8 +340,9 @@ void RecordEditorDialog::AddRow(int field, int row) {
     h->addWidget(choose);
     label = cell;
   }
-  grid_->addWidget(label, row, 0, Qt::AlignTop);
-  grid_->addWidget(control, row, 1);
+  const bool tall = type == FieldType::Text || type == FieldType::Note || type == FieldType::DBPopup;
+  grid_->addWidget(label, row, 0, tall ? Qt::AlignTop : Qt::AlignVCenter);
+  grid_->addWidget(control, row, 1, control->maximumWidth() < QWIDGETSIZE_MAX ? Qt::AlignLeft : Qt::Alignment());
   labels_.push_back(label);
   controls_[field] = control;
 }
@@ -339,6 +353,7 @@ QWidget* RecordEditorDialog::MakeTextBox(int field, int height) {
   box->setFixedHeight(height + box->frameWidth() * 2 + 8);
   box->setTabChangesFocus(true);
   box->setReadOnly(viewOnly_);
+  if (viewOnly_) LookReadOnly(box);
   box->installEventFilter(this);
   auto lastGood = std::make_shared<QString>(box->toPlainText());
   connect(box, &QPlainTextEdit::textChanged, this, [this, box, field, lastGood] {
@@ -370,6 +385,7 @@ QWidget* RecordEditorDialog::MakeNumberBox(int field) {
   const QString pattern = isFloat ? QStringLiteral("[+-]?[0-9]*([.,][0-9]*)?") : QStringLiteral("[+-]?[0-9]*");
   box->setValidator(new QRegularExpressionValidator(QRegularExpression(pattern), box));
   box->setReadOnly(viewOnly_);
+  if (viewOnly_) LookReadOnly(box);
   connect(box, &QLineEdit::textEdited, this, [this, field](const QString& text) {
     form_->SetText(field, text.toStdString());
   });
@@ -502,6 +518,10 @@ void RecordEditorDialog::keyPressEvent(QKeyEvent* event) {
 }
 
 bool RecordEditorDialog::eventFilter(QObject* watched, QEvent* event) {
+  if (event->type() == QEvent::Resize && scroll_ && watched == scroll_->viewport()) {
+    if (grid_) UpdateLabelWidths();
+    return false;
+  }
   // A text box would page through its own text: in this form the page
   // keys go from record to record.
   if (event->type() == QEvent::KeyPress) {

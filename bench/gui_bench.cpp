@@ -1,8 +1,8 @@
 // The desktop list on generated databases up to the largest a file can hold
 // (65504 records): from opening a file until its first rows are painted,
 // jumping to the last row (which should cost the same at 100 and at 65504
-// records: the list reads only the rows on screen) and a sort from a column
-// heading. Runs on the offscreen platform.
+// records: the list reads only the rows on screen), a sort from a column
+// heading and the auto fit of a column. Runs on the offscreen platform.
 //
 //   bench_gui [benchmark options]
 //   bench_gui --first-paint FILE   (start, open, first paint, exit: the
@@ -120,9 +120,26 @@ void BM_HeaderSort(benchmark::State& state) {
   CloseAll(*session);
 }
 
+// Auto fit measures the text of the column's every value in the list's font.
+void BM_AutoFit(benchmark::State& state) {
+  const std::string& file = GeneratedFiles().Get(static_cast<size_t>(state.range(0)));
+  auto session = NewSession();
+  session->workspace().Open(file);
+  Document* doc = session->workspace().shown();
+  const QFontMetrics metrics = session->window().list()->fontMetrics();
+  for (auto _ : state) {
+    doc->AutoFit(kNotes, [&metrics](const std::string& text) {
+      return metrics.horizontalAdvance(QString::fromLatin1(text.data(), static_cast<qsizetype>(text.size())));
+    });
+    Paint(*session);
+  }
+  CloseAll(*session);
+}
+
 BENCHMARK(BM_OpenToFirstPaint)->Arg(100)->Arg(65504)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_JumpToLastRow)->Arg(100)->Arg(65504)->Unit(benchmark::kMicrosecond);
 BENCHMARK(BM_HeaderSort)->Arg(100)->Arg(65504)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_AutoFit)->Arg(65504)->Unit(benchmark::kMillisecond);
 
 int OpenAndPaint(const char* file, bool sortToo) {
   auto session = NewSession();

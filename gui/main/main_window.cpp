@@ -10,6 +10,7 @@
 #include <QMenu>
 #include <QMenuBar>
 #include <QMessageBox>
+#include <QProgressDialog>
 #include <QToolBar>
 #include <QVBoxLayout>
 #include <memory>
@@ -500,7 +501,19 @@ void MainWindow::autoFit(int column) {
   if (!doc || field < 0) return;
   const QFontMetrics metrics = list_->fontMetrics();
   WaitCursor wait;
-  doc->AutoFit(field, [&metrics](const std::string& text) { return metrics.horizontalAdvance(FromDb(text)); });
+  // Every value of the column is measured: on the largest files that can
+  // take a while, and the progress shows once it takes over a second.
+  const int rows = static_cast<int>(doc->rowCount());
+  QProgressDialog progress(QStringLiteral("Fitting the column to its values..."), QString(), 0, rows, this);
+  progress.setObjectName(QStringLiteral("autoFitProgress"));
+  progress.setWindowModality(Qt::WindowModal);
+  progress.setMinimumDuration(1000);
+  progress.setCancelButton(nullptr);
+  int measured = 0;
+  doc->AutoFit(field, [&](const std::string& text) {
+    if ((++measured & 1023) == 0) progress.setValue(qMin(measured, rows));
+    return metrics.horizontalAdvance(FromDb(text));
+  });
 }
 
 void MainWindow::showHelpContents() { ShowHelp(this, QString::fromLatin1(kHelpContents)); }

@@ -11,6 +11,7 @@
 #include <QVBoxLayout>
 
 #include "app/data_dialogs.h"
+#include "gui/common/help.h"
 #include "gui/common/text.h"
 #include "platform/tcp_transport.h"
 
@@ -188,6 +189,7 @@ std::vector<std::string> ChooseBeamPeers(QWidget* parent, Settings& settings) {
   QDialog dialog(parent);
   dialog.setObjectName("beamPeerDialog");
   dialog.setWindowTitle("Beam To");
+  InstallHelpShortcut(&dialog, QStringLiteral("Beam_Dialog"));
   auto* layout = new QVBoxLayout(&dialog);
   layout->addWidget(new QLabel("Computer to beam to (HOST or HOST:PORT):", &dialog));
   auto* peer = new QComboBox(&dialog);

@@ -14,6 +14,8 @@
 #include <QRadioButton>
 #include <QVBoxLayout>
 
+#include "gui/common/help.h"
+
 namespace cx::gui {
 
 class FileChooser : public QWidget {
@@ -64,6 +66,7 @@ QComboBox* EncodingBox(QWidget* parent) {
 CsvExportDialog::CsvExportDialog(const QString& suggestedPath, QWidget* parent) : QDialog(parent) {
   setObjectName("csvExportDialog");
   setWindowTitle("Export Records");
+  InstallHelpShortcut(this, QStringLiteral("Csv_Export"));
   auto* layout = new QVBoxLayout(this);
   auto* form = new QFormLayout;
   file_ = new FileChooser(true, "csvExportPath", this);
@@ -122,6 +125,7 @@ void CsvExportDialog::accept() {
 CsvImportDialog::CsvImportDialog(const QString& folder, QWidget* parent) : QDialog(parent) {
   setObjectName("csvImportDialog");
   setWindowTitle("Import Records");
+  InstallHelpShortcut(this, QStringLiteral("Csv_Export"));
   auto* layout = new QVBoxLayout(this);
   auto* form = new QFormLayout;
   file_ = new FileChooser(false, "csvImportPath", this);

@@ -16,6 +16,7 @@
 #include <QTimeEdit>
 #include <QVBoxLayout>
 
+#include "gui/common/help.h"
 #include "app/data_dialogs.h"
 #include "engine/dates.h"
 #include "engine/format.h"
@@ -65,6 +66,7 @@ QLineEdit* TextBox(QWidget* parent, const QString& name, int maxChars) {
 EditFiltersDialog::EditFiltersDialog(Database& db, QWidget* parent) : QDialog(parent), db_(db) {
   setObjectName("editFiltersDialog");
   setWindowTitle("Edit Filters");
+  InstallHelpShortcut(this, QStringLiteral("Filter_Dialog"));
   auto* layout = new QVBoxLayout(this);
   layout->addWidget(BuildFilter(0));
   auto* join = new QHBoxLayout;

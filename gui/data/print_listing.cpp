@@ -6,6 +6,7 @@
 #include <QTextDocument>
 #include <QTextOption>
 
+#include "gui/common/help.h"
 #include "gui/common/text.h"
 #include "ops/text_sink.h"
 
@@ -38,6 +39,7 @@ bool PreviewAndPrint(QWidget* parent, const QString& listing, const QString& tit
   QPrintPreviewDialog preview(&printer, parent);
   preview.setObjectName("printPreview");
   preview.setWindowTitle(title);
+  InstallHelpShortcut(&preview, QStringLiteral("Print_Records"));
   QObject::connect(&preview, &QPrintPreviewDialog::paintRequested, &preview,
                    [&](QPrinter* p) { PrintListing(*p, listing, title); });
   return preview.exec() == QDialog::Accepted;

@@ -13,6 +13,7 @@
 #include <condition_variable>
 #include <mutex>
 
+#include "gui/common/help.h"
 #include "app/data_dialogs.h"
 #include "design/security.h"
 #include "infrared/beam_commands.h"
@@ -99,6 +100,7 @@ ReceiveWindow::ReceiveWindow(Settings& settings, std::string dataFolder, UiPort&
       sink_(std::make_unique<Sink>(this, stop_)) {
   setObjectName("receiveWindow");
   setWindowTitle("Receive");
+  InstallHelpShortcut(this, QStringLiteral("Receive_Window"));
   auto* layout = new QVBoxLayout(this);
   auto* form = new QFormLayout;
   address_ = new QLineEdit(this);

@@ -10,6 +10,7 @@
 #include <QPushButton>
 #include <QVBoxLayout>
 
+#include "gui/common/help.h"
 #include "engine/format.h"
 #include "gui/common/text.h"
 #include "gui/data/data_util.h"
@@ -21,6 +22,7 @@ namespace cx::gui {
 ReportChooserDialog::ReportChooserDialog(const Database& db, int preselect, QWidget* parent) : QDialog(parent) {
   setObjectName("reportChooserDialog");
   setWindowTitle("Run Report");
+  InstallHelpShortcut(this, QStringLiteral("Report_Dialog"));
   auto* layout = new QVBoxLayout(this);
   layout->addWidget(new QLabel("Select field to report:", this));
   list_ = new QListWidget(this);
@@ -55,6 +57,7 @@ ReportResultsDialog::ReportResultsDialog(std::string report, QWidget* parent)
     : QDialog(parent), report_(std::move(report)) {
   setObjectName("reportResultsDialog");
   setWindowTitle("Report Results");
+  InstallHelpShortcut(this, QStringLiteral("Report_Dialog"));
   auto* layout = new QVBoxLayout(this);
   text_ = new QPlainTextEdit(this);
   text_->setObjectName("reportText");

@@ -9,6 +9,7 @@
 #include <QPushButton>
 #include <QVBoxLayout>
 
+#include "gui/common/help.h"
 #include "engine/format.h"
 #include "gui/common/text.h"
 
@@ -20,6 +21,8 @@ constexpr int kSearchTextChars = 34;
 SearchDialog::SearchDialog(const Database& db, QWidget* parent) : QDialog(parent) {
   setObjectName("searchDialog");
   setWindowTitle("Search Database");
+  setMinimumWidth(320);
+  InstallHelpShortcut(this, QStringLiteral("Find_Dialog"));
   auto* layout = new QVBoxLayout(this);
   auto* form = new QFormLayout;
   text_ = new QLineEdit(this);

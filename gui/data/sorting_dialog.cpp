@@ -9,6 +9,7 @@
 #include <QRadioButton>
 #include <QVBoxLayout>
 
+#include "gui/common/help.h"
 #include "engine/format.h"
 #include "gui/common/text.h"
 
@@ -17,6 +18,8 @@ namespace cx::gui {
 SortingDialog::SortingDialog(Database& db, UiPort& ui, QWidget* parent) : QDialog(parent), db_(db), ui_(ui) {
   setObjectName("sortingDialog");
   setWindowTitle("Sorting");
+  setMinimumWidth(300);
+  InstallHelpShortcut(this, QStringLiteral("Sort_Dialog"));
   auto* layout = new QVBoxLayout(this);
   const char* titles[3] = {"Primary Sort", "Secondary Sort", "Tertiary Sort"};
   const char* names[3] = {"primary", "secondary", "tertiary"};

@@ -7,11 +7,13 @@
 namespace cx::gui {
 
 void AddMainShots(ShotContext& shots);
+void AddDataShots(ShotContext& shots);  // gui/data/data_shots.cpp
 void AddEditorShots(ShotContext& shots);  // gui/editor/editor_shots.cpp
 
 using ShotHook = void (*)(ShotContext&);
 inline constexpr ShotHook kShotHooks[] = {
     &AddMainShots,
+    &AddDataShots,
     &AddEditorShots,
 };
 

@@ -6,6 +6,8 @@
 
 #include <QCheckBox>
 #include <QFileDialog>
+#include <QImage>
+#include <QRegularExpression>
 #include <QLabel>
 #include <QProcess>
 #include <QComboBox>
@@ -15,6 +17,7 @@
 #include <QtTest>
 
 #include "design/link_access.h"
+#include "gui/common/help.h"
 #include "engine/record.h"
 #include "gui/data/csv_dialogs.h"
 #include "gui/data/data_commands.h"
@@ -319,6 +322,23 @@ class DataDialogsTest : public QObject {
     QVERIFY(text.contains("   Item: Espresso beans 1 kg"));
     QVERIFY(text.contains("----------------------------------------"));
     QVERIFY(!text.contains("Photo:"));  // not marked Export/Print
+  }
+
+  void everyDialogHasItsHelpSectionAndPicture() {
+    for (const char* anchor : {"Sort_Dialog", "Filter_Dialog", "Find_Dialog", "Report_Dialog", "Csv_Export",
+                               "Transfer_Records", "Print_Records", "Beam_Dialog", "Receive_Window"}) {
+      QVERIFY2(gui::HelpHasAnchor(anchor), anchor);
+    }
+    QFile help(":/help/cardovex.html");
+    QVERIFY(help.open(QIODevice::ReadOnly));
+    const QString html = QString::fromUtf8(help.readAll());
+    static const QRegularExpression picture("<img src=\"(data-[a-z-]+\\.png)\"");
+    int pictures = 0;
+    for (auto it = picture.globalMatch(html); it.hasNext(); ++pictures) {
+      const QString name = it.next().captured(1);
+      QVERIFY2(QImage(":/help/" + name).width() > 0, qPrintable(name));
+    }
+    QVERIFY(pictures >= 8);
   }
 
   void transferCopiesIntoTheChosenDatabaseAndRefusesAMoveToItself() {

@@ -75,7 +75,7 @@ void FieldEditorDialog::Build() {
   const Schema& schema = session_.db.schema();
   name_ = MakeEdit(this, "name");
   name_->setMaxLength(kNameChars);
-  name_->setMinimumWidth(200);
+  name_->setMinimumWidth(240);
   type_ = new QComboBox(this);
   type_->setObjectName(QStringLiteral("type"));
   for (int t = 0; t < kFieldTypeCount; ++t) type_->addItem(Label(FieldTypeLabel(TypeFromNumber(t))));

@@ -7,14 +7,12 @@
 namespace cx::gui {
 
 void AddMainShots(ShotContext& shots);
-void AddDataShots(ShotContext& shots);  // gui/data/data_shots.cpp
-void AddEditorShots(ShotContext& shots);  // gui/editor/editor_shots.cpp
+void AddDesignShots(ShotContext& shots);  // gui/design/design_shots.cpp
 
 using ShotHook = void (*)(ShotContext&);
 inline constexpr ShotHook kShotHooks[] = {
     &AddMainShots,
-    &AddDataShots,
-    &AddEditorShots,
+    &AddDesignShots,
 };
 
 }  // namespace cx::gui

@@ -12,6 +12,7 @@
 #include "design/popup_editor.h"
 #include "design/security.h"
 #include "engine/record.h"
+#include "gui/common/help.h"
 #include "gui/design/author_dialog.h"
 #include "gui/design/edit_database_dialog.h"
 #include "gui/design/field_order_dialog.h"
@@ -36,6 +37,16 @@ class DatabaseDialogsTest : public QObject {
  private slots:
   void init() { ui_ = ScriptedUi(); }
   void cleanup() { StopModalWatchers(); }
+
+  // F1 in each dialog opens a section that exists, with its picture.
+  void helpSectionsExist() {
+    for (const char* anchor : {"Edit_Database", "Edit_Field", "Edit_Popup_List",
+                               "Author_Information", "Edit_Field_Order", "Security_Access"}) {
+      QVERIFY2(HelpHasAnchor(QString::fromLatin1(anchor)), anchor);
+    }
+    QVERIFY(QFile::exists(":/help/design-security.png"));
+    QVERIFY(QFile::exists(":/help/design-edit-field-calculated.png"));
+  }
 
   void editDatabaseListsEverySlotAndKeepsNineteenCharacters() {
     Database db = MakeDatabase(dir_.File("e.PDB"), {{"Only", FieldType::Text}}, "Old");

@@ -4,6 +4,9 @@
 #include <QCheckBox>
 #include <QDialogButtonBox>
 #include <QFile>
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QJsonObject>
 #include <QLineEdit>
 #include <QMainWindow>
 #include <QMenu>
@@ -19,7 +22,9 @@
 
 #include "app/preferences.h"
 #include "design/security.h"
+#include "app/image_picture.h"
 #include "gui/common/text.h"
+#include "ops/field_values.h"
 #include "gui/editor/editor_commands.h"
 #include "gui/editor/image_editor_dialog.h"
 #include "gui/editor/record_editor_dialog.h"
@@ -143,6 +148,7 @@ class EditorTest : public QObject {
   void viewOnlyRefusesEdits();
   void pageDownKeepsTheEditsAndMovesOn();
   void imageEditorKeepsUntouchedPicturesAndDraws();
+  void everyRecordOfEverySampleTakesAChangeInEachType();
   void undoAndRedoFromTheWindow();
 };
 
@@ -445,6 +451,121 @@ void EditorTest::imageEditorKeepsUntouchedPicturesAndDraws() {
   QVERIFY(!PictureInk(drawn, 31, 20));
   dialog.findChild<QPushButton*>(QStringLiteral("clearButton"))->click();
   QVERIFY(dialog.result().empty());
+}
+
+namespace {
+
+// A different value of the same type, as a user would enter it.
+void ChangeValue(RecordForm& form, int field) {
+  switch (form.TypeOf(field)) {
+    case FieldType::Text:
+    case FieldType::Note:
+    case FieldType::DBPopup:
+      form.SetText(field, form.Text(field).substr(0, 3) + "\xe9dited");
+      break;
+    case FieldType::Linked:
+      form.SetText(field, "re-linked");
+      break;
+    case FieldType::Integer:
+      form.SetText(field, std::to_string(ParseLong(form.Text(field)) + 7));
+      break;
+    case FieldType::Float:
+      form.SetText(field, "12.5");
+      break;
+    case FieldType::PopUp:
+      form.SetByte(field, form.Byte(field) == 0 ? 1 : 0);
+      break;
+    case FieldType::CheckBox:
+      form.SetByte(field, form.Byte(field) == 0 ? 1 : 0);
+      break;
+    case FieldType::Date:
+      form.SetNumber(field, form.Number(field) + 31);
+      break;
+    case FieldType::Time: {
+      TimeBytes t = form.Time(field);
+      t.hours = t.none() ? 8 : static_cast<uint8_t>((t.hours + 1) % 24);
+      form.SetTime(field, t);
+      break;
+    }
+    case FieldType::Image: {
+      Bytes picture = form.Image(field).empty() ? NewPicture() : form.Image(field);
+      DrawPictureLine(picture, 0, 0, 159, 99, true);
+      form.SetImage(field, picture);
+      break;
+    }
+    default:
+      break;
+  }
+}
+
+std::vector<std::vector<std::string>> AllTexts(const Document& doc) {
+  std::vector<std::vector<std::string>> all;
+  for (size_t r = 0; r < doc.db().recordCount(); ++r) {
+    std::vector<std::string> texts;
+    for (int f = 0; f < format::kFieldCount; ++f) {
+      texts.push_back(IsCalculated(doc.db().schema(), f) ? std::string() : doc.ValueText(r, f));
+    }
+    all.push_back(texts);
+  }
+  return all;
+}
+
+}  // namespace
+
+void EditorTest::everyRecordOfEverySampleTakesAChangeInEachType() {
+  Desk desk;
+  for (const char* sample : {"Contacts", "Orders", "Vault"}) {
+    Database db;
+    QVERIFY(db.Open(desk.Path(sample), desk.ui).ok());
+    Document doc(*desk.context, db);
+    doc.RebuildView();
+    const size_t count = db.recordCount();
+    for (size_t r = 0; r < count; ++r) {
+      auto before = AllTexts(doc);
+      RecordEditorDialog editor(doc, r, false, nullptr, &desk.window);
+      std::vector<int> changed;
+      for (int f : editor.form().fields()) {
+        ChangeValue(editor.form(), f);
+        if (editor.form().Modified(f)) changed.push_back(f);
+      }
+      QVERIFY(!changed.empty());
+      std::vector<std::string> expected = before[r];
+      for (int f : changed) expected[f] = editor.form().DisplayText(f);
+      QVERIFY(editor.Apply());
+      auto after = AllTexts(doc);
+      // The edited record holds its new values and nothing else changed;
+      // the other records are as they were (in whatever order the sort
+      // put them).
+      QCOMPARE(after[editor.record()], expected);
+      after.erase(after.begin() + static_cast<long>(editor.record()));
+      before.erase(before.begin() + static_cast<long>(r));
+      std::sort(after.begin(), after.end());
+      std::sort(before.begin(), before.end());
+      QVERIFY(after == before);
+    }
+    QVERIFY(db.Save().ok());
+
+    // The command-line tool reads back exactly what the editor holds.
+    QProcess cli;
+    // In the regional settings the editor used.
+    cli.start(QStringLiteral(CARDOVEX_CLI), {QStringLiteral("--date-format"), QString::fromStdString(desk.locale.shortDate),
+                                             QStringLiteral("--time-format"), QString::fromStdString(desk.locale.timeFormat),
+                                             QStringLiteral("--decimal"), QStringLiteral("."),
+                                             QStringLiteral("--password"), QStringLiteral("secret"),
+                                             QStringLiteral("records"), QStringLiteral("--all"),
+                                             QStringLiteral("--json"), QString::fromStdString(desk.Path(sample))});
+    QVERIFY(cli.waitForFinished(30000));
+    QVERIFY2(cli.exitCode() == 0, cli.readAllStandardError().constData());
+    const QJsonArray records = QJsonDocument::fromJson(cli.readAllStandardOutput()).array();
+    QCOMPARE(static_cast<size_t>(records.size()), count);
+    for (size_t r = 0; r < count; ++r) {
+      for (const QJsonValue& v : records[static_cast<int>(r)].toObject()[QStringLiteral("fields")].toArray()) {
+        const QJsonObject field = v.toObject();
+        const int slot = field[QStringLiteral("slot")].toInt();
+        QCOMPARE(field[QStringLiteral("text")].toString(), FromDb(doc.ValueText(r, slot)));
+      }
+    }
+  }
 }
 
 void EditorTest::undoAndRedoFromTheWindow() {

@@ -8,11 +8,15 @@ namespace cx::gui {
 
 void AddMainShots(ShotContext& shots);
 void AddDesignShots(ShotContext& shots);  // gui/design/design_shots.cpp
+void AddDataShots(ShotContext& shots);  // gui/data/data_shots.cpp
+void AddEditorShots(ShotContext& shots);  // gui/editor/editor_shots.cpp
 
 using ShotHook = void (*)(ShotContext&);
 inline constexpr ShotHook kShotHooks[] = {
     &AddMainShots,
     &AddDesignShots,
+    &AddDataShots,
+    &AddEditorShots,
 };
 
 }  // namespace cx::gui

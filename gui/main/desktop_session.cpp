@@ -2,6 +2,7 @@
 
 #include <QDir>
 
+#include "gui/main/record_list_view.h"
 #include "platform/data_folder.h"
 #include "platform/file_io.h"
 #include "platform/qt/qt_platform.h"
@@ -35,6 +36,7 @@ bool DesktopSession::Start(const std::vector<std::string>& files, bool showWindo
   if (showWindow) window_->show();
   const bool open = workspace_->Start(files);
   window_->RebuildList();
+  window_->list()->setFocus();
   return open;
 }
 

@@ -8,6 +8,7 @@
 #include <QHeaderView>
 #include <QLabel>
 #include <QMouseEvent>
+#include <QSignalSpy>
 #include <QListWidget>
 #include <QTest>
 #include <QTimer>
@@ -260,6 +261,36 @@ class TestMainWindow : public QObject {
     QCOMPARE(cell0, on);
     QCOMPARE(cell1, off);
     QVERIFY(on != off);
+  }
+
+  void tapsOutsideTheRowsDoNothing() {
+    DesktopSession& s = Start({QStringLiteral("Contacts")});
+    auto* list = s.window().list();
+    list->resize(600, 400);
+    cx::Document* doc = s.workspace().shown();
+    const size_t current = doc->currentRecord();
+    QSignalSpy taps(list, &cx::gui::RecordListView::cellTapped);
+    // Below the last row: no tap, no dialog, the current record stays.
+    const int below = list->rowViewportPosition(3) + 3 * list->rowHeight(3);
+    QTest::mouseClick(list->viewport(), Qt::LeftButton, {}, QPoint(20, below));
+    QCOMPARE(taps.count(), 0);
+    QVERIFY(!QApplication::activeModalWidget());
+    QCOMPARE(doc->currentRecord(), current);
+  }
+
+  void hidingEveryColumnLeavesAnEmptyHeaderButTheRows() {
+    DesktopSession& s = Start({QStringLiteral("Contacts")});
+    cx::Document* doc = s.workspace().shown();
+    while (s.window().model()->columnCount() > 0) {
+      const int before = s.window().model()->columnCount();
+      doc->HideField(s.window().model()->FieldOfColumn(0));
+      QCOMPARE(s.window().model()->columnCount(), before - 1);
+    }
+    QCOMPARE(s.window().model()->rowCount(), 4);
+    QCOMPARE(Title(s), QStringLiteral("Contacts* (4/4)"));
+    // Selecting and painting a list without columns must hold.
+    s.window().list()->SelectRow(2);
+    s.window().list()->viewport()->grab();
   }
 
   void closeShowsTheStartDialogOverAnEmptyList() {

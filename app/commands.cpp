@@ -26,6 +26,8 @@ const std::vector<CommandInfo>& CommandTable() {
       {C::FindAgain, "Find Again", M::Records, kNone, "F3", true, false},
       {C::Filter, "Filter...", M::Records, kNone, "", true, true},
       {C::Sort, "Sort...", M::Records, kNone, "", true, false},
+      {C::DisableFilters, "Disable both filters", M::Records, kNone, "", true, false},
+      {C::Recalculate, "Recalculate", M::Records, kNone, "", true, false},
       {C::DeleteRecords, "Delete Records...", M::Records, secured::kDeleteRecords, "Del", true, true},
       {C::MoveRecords, "Move Records To...", M::Records, kNone, "", true, true},
       {C::CopyRecords, "Copy Records To...", M::Records, kNone, "", true, false},

@@ -29,6 +29,8 @@ enum class Command {
   FindAgain,
   Filter,
   Sort,
+  DisableFilters,
+  Recalculate,
   DeleteRecords,
   MoveRecords,
   CopyRecords,

@@ -110,6 +110,8 @@ MainWindow::Slot MainWindow::SlotOf(Command command) {
     case Command::FindAgain: return &MainWindow::findAgain;
     case Command::Filter: return &MainWindow::showFilterDialog;
     case Command::Sort: return &MainWindow::showSortDialog;
+    case Command::DisableFilters: return &MainWindow::disableFilters;
+    case Command::Recalculate: return &MainWindow::recalculate;
     case Command::DeleteRecords: return &MainWindow::deleteRecords;
     case Command::MoveRecords: return &MainWindow::moveRecordsTo;
     case Command::CopyRecords: return &MainWindow::copyRecordsTo;
@@ -572,6 +574,12 @@ void MainWindow::showSortDialog() {
 }
 void MainWindow::showFilterDialog() {
   if (Document* doc = document()) EditFiltersCommand(this, TargetFor(*doc));
+}
+void MainWindow::disableFilters() {
+  if (Document* doc = document()) DisableFiltersCommand(TargetFor(*doc));
+}
+void MainWindow::recalculate() {
+  if (Document* doc = document()) RecalculateCommand(this, TargetFor(*doc));
 }
 void MainWindow::showFindDialog() {
   if (Document* doc = document()) SearchDatabaseCommand(this, TargetFor(*doc));

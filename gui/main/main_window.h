@@ -106,6 +106,8 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   // Data dialogs.
   void showSortDialog();
   void showFilterDialog();
+  void disableFilters();
+  void recalculate();
   void showFindDialog();
   void runReport();
   void runHeadingReport(int field);

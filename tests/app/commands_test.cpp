@@ -16,7 +16,7 @@ const std::set<Command> kNeedDatabase = {
     Command::Filter,       Command::Sort,          Command::RunReport,    Command::MoveRecords,
     Command::CopyRecords,  Command::ExportRecords, Command::DeleteRecords, Command::DBProperties,
     Command::BeamRecords,  Command::BeamDatabase,  Command::PrintRecords, Command::NewRecord,
-    Command::ImportRecords};
+    Command::ImportRecords, Command::DisableFilters, Command::Recalculate};
 
 class CommandsTest : public AppFixture {};
 

@@ -145,6 +145,7 @@ class EditorTest : public QObject {
   void linkLevelsAndBack();
   void dbPopupChoosesFromTheOtherDatabase();
   void missingLinkedDatabaseSaysSoAndReturns();
+  void linkedRecordIsReassigned();
   void viewOnlyRefusesEdits();
   void pageDownKeepsTheEditsAndMovesOn();
   void imageEditorKeepsUntouchedPicturesAndDraws();
@@ -375,6 +376,53 @@ void EditorTest::missingLinkedDatabaseSaysSoAndReturns() {
   QCOMPARE(desk.workspace->level(), 0);
   QVERIFY(!desk.ui.messages.empty());
   QCOMPARE(desk.ui.messages.back().text, std::string("Linked Database is not present on this device!"));
+}
+
+void EditorTest::linkedRecordIsReassigned() {
+  Desk desk;
+  QVERIFY(desk.Open("Orders"));
+  const int customer = desk.FieldNamed("Customer");
+  const size_t order = desk.doc().recordAt(0);
+  const uint32_t linkedTo = ValueNumber(desk.Value(order, customer));
+  QVERIFY(linkedTo != 0);
+  WhenShown(QStringLiteral("recordEditor"), [=](QWidget* w) {
+    w->findChild<QPushButton*>(QStringLiteral("link_") + QString::number(customer))->click();
+  });
+  desk.commands->OpenRecordAt(0, 0, QPoint());
+  QCOMPARE(desk.workspace->level(), 1);
+  QCOMPARE(desk.workspace->levels().shown().mode, LevelMode::Reassign);
+  Document& contacts = desk.doc();
+  const int ordersLink = desk.FieldNamed("Orders");  // Contacts' Link field holds the number
+  const size_t current = contacts.currentRecord();
+  QCOMPARE(ValueNumber(*FieldValue(contacts.db().record(current), ordersLink)), linkedTo);
+  const int other = current == contacts.recordAt(0) ? 1 : 0;
+  const uint32_t newNumber = ValueNumber(*FieldValue(contacts.db().record(contacts.recordAt(other)), ordersLink));
+
+  // No: an ordinary tap, the contact's own editor.
+  desk.ui.yesNoAnswers = {false};
+  bool contactEditor = false;
+  WhenShown(QStringLiteral("recordEditor"), [&](QWidget* w) {
+    contactEditor = static_cast<RecordEditorDialog*>(w)->record() == contacts.recordAt(other);
+    static_cast<QDialog*>(w)->reject();
+  });
+  desk.commands->OpenRecordAt(other, 0, QPoint());
+  QVERIFY(contactEditor);
+  QCOMPARE(desk.workspace->level(), 1);
+  QCOMPARE(desk.ui.questions.back().text, std::string("Would you like to reassign the linked record to this record?"));
+
+  // Yes: the order is linked to that contact, and its editor comes back.
+  desk.ui.yesNoAnswers = {true};
+  bool orderEditor = false;
+  WhenShown(QStringLiteral("recordEditor"), [&](QWidget* w) {
+    orderEditor = true;
+    PressOk(w);
+  });
+  desk.commands->OpenRecordAt(other, 0, QPoint());
+  QVERIFY(orderEditor);
+  QCOMPARE(desk.workspace->level(), 0);
+  const size_t now = desk.doc().currentRecord();
+  QCOMPARE(ValueNumber(desk.Value(now, customer)), newNumber);
+  QVERIFY(!ValueString(desk.Value(now, customer).subspan(24)).empty());
 }
 
 void EditorTest::viewOnlyRefusesEdits() {

@@ -256,6 +256,11 @@ RecordForm::RecordForm(DataSession& session, size_t index, const Clock& clock,
         break;
     }
   }
+  // Added at a linked level: the record is linked to the record beneath,
+  // or it would vanish from the view it was added in.
+  if (const LinkRestriction* link = session_.Link(); link && link->field >= 0 && link->field < format::kFieldCount) {
+    SetNumber(link->field, link->value);
+  }
   baseline_ = editing_;
 }
 

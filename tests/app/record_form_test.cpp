@@ -267,6 +267,13 @@ TEST(RecordFormValues, NewRecordDefaultsAndSavingFills) {
   EXPECT_EQ(edit.Number(added), 0u);
   EXPECT_EQ(edit.Time(modified).hours, 12);
 
+  // Added where the view shows the records linked to another one: linked
+  // to it too.
+  t.session.link = LinkRestriction{link, 7};
+  RecordForm linked(t.session, kNewRecordIndex, kClock);
+  EXPECT_EQ(linked.Number(link), 7u);
+  t.session.link.reset();
+
   // A copy gets numbers of its own.
   RecordForm copy(t.session, kNewRecordIndex, kClock, size_t{0});
   EXPECT_EQ(copy.Number(unique), 0u);

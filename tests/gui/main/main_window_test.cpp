@@ -9,7 +9,9 @@
 #include <QLabel>
 #include <QMouseEvent>
 #include <QSignalSpy>
+#include <QCheckBox>
 #include <QListWidget>
+#include <QMenu>
 #include <QTest>
 #include <QTimer>
 
@@ -324,6 +326,52 @@ class TestMainWindow : public QObject {
     s.window().action(QStringLiteral("Close"))->trigger();
     QVERIFY(start.answered());
     QCOMPARE(Title(s), QStringLiteral("Orders (5/5)"));
+  }
+
+  void preferencesChangeOnlyOnOk() {
+    DesktopSession& s = Start({QStringLiteral("Contacts")});
+    const cx::PreferenceFlags before = s.preferences().flags;
+    QVERIFY(before.autoSave && before.allowChecks && !before.allowPopups);
+    auto toggle = [](QWidget* dialog, bool ok) {
+      dialog->findChild<QCheckBox*>(QStringLiteral("AutoSave"))->setChecked(false);
+      dialog->findChild<QCheckBox*>(QStringLiteral("AllowPopups"))->setChecked(true);
+      ok ? ModalAnswer::Accept()(dialog) : ModalAnswer::Reject()(dialog);
+    };
+    {
+      ModalAnswer cancel([&](QWidget* w) { toggle(w, false); });
+      s.window().action(QStringLiteral("Preferences..."))->trigger();
+      QCOMPARE(cancel.title(), QStringLiteral("Preferences"));
+      QVERIFY(s.preferences().flags == before);
+    }
+    {
+      ModalAnswer ok([&](QWidget* w) { toggle(w, true); });
+      s.window().action(QStringLiteral("Preferences..."))->trigger();
+      QVERIFY(ok.answered());
+      QVERIFY(!s.preferences().flags.autoSave);
+      QVERIFY(s.preferences().flags.allowPopups);
+    }
+    // Nothing reaches the settings store before the end.
+    QCOMPARE(s.settings().Get("AllowPopups"), std::optional<std::string>());
+    s.Shutdown();
+    QCOMPARE(s.settings().Get("AllowPopups"), std::optional<std::string>("1"));
+    QCOMPARE(s.settings().Get("AutoSave"), std::optional<std::string>("0"));
+  }
+
+  void reopenNamesKeepTheirAmpersands() {
+    DesktopSession& s = Start({});
+    const std::string path = dir_->File("Cartoons.PDB");
+    cx::Database db = cx::Database::CreateNew(path, "Tom & Jerry");
+    QVERIFY(db.Save().ok());
+    s.recent().Add(path);
+    auto* reopen = s.window().findChild<QMenu*>(QStringLiteral("reopenMenu"));
+    QVERIFY(reopen);
+    emit reopen->aboutToShow();
+    QStringList texts;
+    for (QAction* a : reopen->actions()) texts << a->text();
+    QCOMPARE(texts.first(), QStringLiteral("Tom && Jerry"));
+    QCOMPARE(texts.last(), QStringLiteral("More Files..."));
+    reopen->actions().first()->trigger();
+    QCOMPARE(Title(s), QStringLiteral("Tom & Jerry (0/0)"));
   }
 
   void closingTheWindowAsksAndMayBeCancelled() {

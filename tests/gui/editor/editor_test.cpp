@@ -311,6 +311,17 @@ void EditorTest::linkLevelsAndBack() {
   Document* parent = desk.workspace->documentAt(0);
   QCOMPARE(ValueString(*FieldValue(parent->db().record(record), phone)), std::string("555-0100"));
 
+  // A record added here is linked to the contact, so it stays in view.
+  const size_t linkedRows = desk.doc().rowCount();
+  const int item = desk.FieldNamed("Item");
+  WhenShown(QStringLiteral("recordEditor"), [=](QWidget* w) {
+    auto* editor = static_cast<RecordEditorDialog*>(w);
+    qobject_cast<QPlainTextEdit*>(editor->ControlFor(item))->setPlainText(QStringLiteral("Tamper"));
+    PressOk(editor);
+  });
+  desk.commands->NewRecord();
+  QCOMPARE(desk.doc().rowCount(), linkedRows + 1);
+
   // Closing the level returns to the editor on the parent record.
   size_t reopenedOn = 99;
   bool reopened = false;

@@ -78,7 +78,7 @@ void AddDataShots(ShotContext& shots) {
     QPrinter printer(QPrinter::HighResolution);
     QPrintPreviewWidget preview(&printer);
     QObject::connect(&preview, &QPrintPreviewWidget::paintRequested,
-                     [&](QPrinter* p) { PrintListing(*p, listing, QStringLiteral("Orders")); });
+                     [&](QPrinter* p) { ListingPages(*p, listing).Print(QStringLiteral("Orders")); });
     preview.resize(560, 640);
     preview.fitInView();
     shots.Save(&preview, QStringLiteral("data-print-preview"));

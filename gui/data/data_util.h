@@ -5,6 +5,7 @@
 
 #include <QGuiApplication>
 #include <QString>
+#include <QWidget>  // qt_ui_port.h holds a QPointer<QWidget>
 #include <functional>
 #include <string>
 
@@ -13,7 +14,6 @@
 #include "ops/links.h"
 #include "ops/session.h"
 
-class QWidget;
 
 namespace cx::gui {
 

@@ -312,7 +312,9 @@ class DataDialogsTest : public QObject {
       QPrinter printer(QPrinter::HighResolution);
       printer.setOutputFormat(QPrinter::PdfFormat);
       printer.setOutputFileName(pdf);
-      gui::PrintListing(printer, listing, "Contacts");
+      gui::ListingPages pages(printer, listing);
+      QCOMPARE(pages.count(), 1);
+      QVERIFY(pages.Print("Contacts"));
     }
     QProcess p;
     p.start("pdftotext", {"-layout", pdf, "-"});
@@ -322,6 +324,27 @@ class DataDialogsTest : public QObject {
     QVERIFY(text.contains("   Item: Espresso beans 1 kg"));
     QVERIFY(text.contains("----------------------------------------"));
     QVERIFY(!text.contains("Photo:"));  // not marked Export/Print
+
+    // Long listings go on over pages, and a line wider than the paper
+    // continues below instead of being cut off.
+    QString longListing;
+    for (int i = 0; i < 150; ++i) longListing += QString("Line: %1\n").arg(i);
+    longListing += "Note: " + QString(300, 'x') + "END\n";
+    const QString pdf2 = QString::fromStdString(dir.File("long.pdf"));
+    QPrinter printer(QPrinter::HighResolution);
+    printer.setOutputFormat(QPrinter::PdfFormat);
+    printer.setOutputFileName(pdf2);
+    gui::ListingPages pages(printer, longListing);
+    QVERIFY(pages.count() >= 2);
+    int seen = 0;
+    QVERIFY(pages.Print("Long", [&](int page, int) { return ++seen, page >= 0; }));
+    QCOMPARE(seen, pages.count());
+    QProcess p2;
+    p2.start("pdftotext", {pdf2, "-"});
+    QVERIFY(p2.waitForFinished(30000));
+    const QString text2 = QString::fromUtf8(p2.readAllStandardOutput());
+    QVERIFY(text2.contains("Line: 149"));
+    QVERIFY(text2.contains("xEND"));
   }
 
   void everyDialogHasItsHelpSectionAndPicture() {

@@ -9,7 +9,6 @@
 #include <QLabel>
 #include <QLineEdit>
 #include <QMenuBar>
-#include <QMessageBox>
 #include <QPlainTextEdit>
 #include <QPushButton>
 #include <QRegularExpressionValidator>
@@ -18,6 +17,7 @@
 #include <QShortcut>
 #include <QToolButton>
 #include <QVBoxLayout>
+#include <memory>
 
 #include "app/pickers.h"
 #include "design/security.h"
@@ -25,11 +25,13 @@
 #include "gui/common/help.h"
 #include "gui/common/qt_ui_port.h"
 #include "gui/common/text.h"
+#include "gui/data/data_commands.h"
 #include "gui/editor/image_editor_dialog.h"
 #include "gui/editor/picker_dialogs.h"
 #include "ops/linked_listing.h"
 #include "ops/links.h"
 #include "ops/listing.h"
+#include "platform/qt/qt_platform.h"
 
 namespace cx::gui {
 namespace {
@@ -609,14 +611,19 @@ void RecordEditorDialog::ExportRecord() {
 
 void RecordEditorDialog::PrintRecord() {
   if (form_->isNew()) return;
-  QMessageBox::information(this, QStringLiteral("Print Record..."),
-                           QStringLiteral("Printing a record is not available yet."));
+  if (!viewOnly_ && !Apply()) return;
+  DataTarget target = TargetFor(doc_);
+  target.current = form_->index();
+  PrintCommand(this, target, false);
 }
 
 void RecordEditorDialog::BeamRecord() {
   if (form_->isNew()) return;
-  QMessageBox::information(this, QStringLiteral("Beam Record..."),
-                           QStringLiteral("Beaming a record is not available yet."));
+  if (!viewOnly_ && !Apply()) return;
+  DataTarget target = TargetFor(doc_);
+  target.current = form_->index();
+  std::unique_ptr<Settings> settings = OpenDesktopSettings();
+  BeamCommand(this, target, *settings, obex::BeamWhat::kRecord);
 }
 
 void RecordEditorDialog::DeleteRecord() {

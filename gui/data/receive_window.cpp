@@ -27,6 +27,85 @@
 
 namespace cx::gui {
 
+// Remembers who the listener is talking to, so that the questions about
+// what arrives can name the sender.
+class ReceiveWindow::PeerNaming : public StreamTransport {
+ public:
+  explicit PeerNaming(StreamTransport& inner) : inner_(inner) {}
+  int Open() override { return inner_.Open(); }
+  int FindDevices(std::vector<std::string>& devices) override { return inner_.FindDevices(devices); }
+  std::unique_ptr<StreamConnection> Connect(const std::string& device, int& error) override {
+    return inner_.Connect(device, error);
+  }
+  std::unique_ptr<StreamListener> Listen(const std::string& address, int& error) override {
+    auto listener = inner_.Listen(address, error);
+    return listener ? std::make_unique<Listener>(std::move(listener), *this) : nullptr;
+  }
+  std::string peer() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return peer_;
+  }
+
+ private:
+  class Listener : public StreamListener {
+   public:
+    Listener(std::unique_ptr<StreamListener> inner, PeerNaming& owner) : inner_(std::move(inner)), owner_(owner) {}
+    std::unique_ptr<StreamConnection> Accept(int timeoutMs, int& error) override {
+      auto connection = inner_->Accept(timeoutMs, error);
+      if (connection) {
+        std::lock_guard<std::mutex> lock(owner_.mutex_);
+        owner_.peer_ = connection->peer();
+      }
+      return connection;
+    }
+    std::string address() const override { return inner_->address(); }
+
+   private:
+    std::unique_ptr<StreamListener> inner_;
+    PeerNaming& owner_;
+  };
+
+  StreamTransport& inner_;
+  mutable std::mutex mutex_;
+  std::string peer_;
+};
+
+// The program's port, with each question saying which computer sent what
+// it asks about.
+class FromPeerUi : public UiPort {
+ public:
+  FromPeerUi(UiPort& inner, std::string peer) : inner_(inner), peer_(std::move(peer)) {}
+  void ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) override {
+    inner_.ShowMessage(text, caption, icon);
+  }
+  bool AskYesNo(const std::string& text, const std::string& caption) override {
+    return inner_.AskYesNo(From() + text, caption);
+  }
+  Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
+    return inner_.AskYesNoCancel(From() + text, caption);
+  }
+  std::optional<std::string> PromptPassword(int attempt) override { return inner_.PromptPassword(attempt); }
+  std::optional<std::string> AskOpenFile(const std::string& title, const std::string& filter) override {
+    return inner_.AskOpenFile(title, filter);
+  }
+  std::optional<std::string> AskSaveFile(const std::string& title, const std::string& filter,
+                                         const std::string& suggested) override {
+    return inner_.AskSaveFile(title, filter, suggested);
+  }
+  void SetBusy(bool busy) override { inner_.SetBusy(busy); }
+
+ private:
+  std::string From() const {
+    std::string host;
+    int port = 0;
+    if (peer_.empty()) return std::string();
+    if (!ParseHostPort(peer_, 0, host, port)) host = peer_;
+    return "From " + host + ":\n";
+  }
+  UiPort& inner_;
+  std::string peer_;
+};
+
 // Runs on the listener's thread: each object waits there while the GUI
 // thread handles it, so the listener never touches a database itself.
 class ReceiveWindow::Sink : public obex::ObjectSink {
@@ -97,6 +176,7 @@ ReceiveWindow::ReceiveWindow(Settings& settings, std::string dataFolder, UiPort&
       shown_(std::move(shown)),
       viewChanged_(std::move(viewChanged)),
       transport_(transport ? std::move(transport) : std::make_unique<TcpTransport>(std::vector<std::string>{})),
+      peers_(std::make_unique<PeerNaming>(*transport_)),
       sink_(std::make_unique<Sink>(this, stop_)) {
   setObjectName("receiveWindow");
   setWindowTitle("Receive");
@@ -157,7 +237,7 @@ bool ReceiveWindow::StartListening() {
   actual_.clear();
   const int generation = ++generation_;
   thread_ = std::thread([this, options, generation] {
-    Status s = RunReceiver(*transport_, *sink_, options, stop_, [this](const std::string& at) {
+    Status s = RunReceiver(*peers_, *sink_, options, stop_, [this](const std::string& at) {
       QMetaObject::invokeMethod(
           this,
           [this, at] {
@@ -206,7 +286,8 @@ uint8_t ReceiveWindow::Handle(obex::ReceivedObject& object) {
     dbs.active = &session->db;
   }
   Hooks hooks(session, viewChanged_);
-  obex::ReceiveStore store(dbs, ui_, hooks, [this](const std::string& line) {
+  FromPeerUi ui(ui_, peers_->peer());
+  obex::ReceiveStore store(dbs, ui, hooks, [this](const std::string& line) {
     AddLine(QString::fromStdString(line));
   });
   const uint8_t code = store.Deliver(object);

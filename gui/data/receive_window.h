@@ -55,6 +55,7 @@ class ReceiveWindow : public QDialog {
  private:
   class Sink;
   class Hooks;
+  class PeerNaming;
   uint8_t Handle(obex::ReceivedObject& object);
   void ListenerEnded(int generation, const std::string& error);
   void AddLine(const QString& line);
@@ -66,6 +67,7 @@ class ReceiveWindow : public QDialog {
   std::function<DataSession*()> shown_;
   std::function<void()> viewChanged_;
   std::unique_ptr<StreamTransport> transport_;
+  std::unique_ptr<PeerNaming> peers_;
   std::unique_ptr<Sink> sink_;
   std::atomic<bool> stop_{false};
   std::thread thread_;

@@ -173,6 +173,8 @@ class BeamTest : public QObject {
     ui.yesNoAnswers = {true, true, true};
     send();  // no password given
     QCOMPARE(db.recordCount(), count);
+    QVERIFY(!ui.questions.empty());
+    QVERIFY2(ui.questions.front().text.rfind("From 127.0.0.1:\n", 0) == 0, ui.questions.front().text.c_str());
     QVERIFY(!ui.messages.empty());
     QCOMPARE(ui.messages.back().caption, std::string("ACCESS DENIED"));
 

@@ -24,10 +24,15 @@
 #include "ops/calc.h"
 #include "ops/find.h"
 #include "ops/linked_listing.h"
+#include "ops/print.h"
 #include "ops/links.h"
 #include "ops/report.h"
 #include "ops/sort.h"
 #include "ops/view.h"
+#include "platform/data_folder.h"
+#include "platform/file_io.h"
+#include "platform/process.h"
+#include "platform/qt/qt_platform.h"
 #include "platform/tcp_transport.h"
 
 namespace cx::gui {
@@ -207,6 +212,23 @@ bool TransferToFile(const DataTarget& t, bool move, bool all, const std::string&
 
 bool PrintCommand(QWidget* parent, const DataTarget& t, bool all) {
   if (!all && !HasRecord(t)) return false;
+  // Where a print command is set, the listing goes to it as the command-line
+  // tool's print does (a printer reached only by a script, say).
+  if (auto command = OpenDesktopSettings()->Get(kPrintCommandSetting); command && !command->empty()) {
+    PrintSettings settings;
+    const QStringList words = QString::fromStdString(*command).split(' ', Qt::SkipEmptyParts);
+    settings.command = words.value(0).toStdString();
+    for (int i = 1; i < words.size(); ++i) settings.arguments.push_back(words[i].toStdString());
+    settings.tempPath = DefaultPrintTempPath(DesktopDocumentsFolder());
+    MakeDirectories(FolderPart(settings.tempPath));
+    WaitCursor wait;
+    LinkServices services = Services(t);
+    LinkedRecordsListing linked(services, t.session.locale);
+    SystemProcessRunner runner;
+    const PrintOutcome outcome = PrintRecords(t.session.db, all, t.current, ListingContext{t.session.locale, &linked},
+                                              settings, runner, t.session.ui, t.session.Link());
+    return outcome == PrintOutcome::Printed;
+  }
   QString listing;
   {
     WaitCursor wait;

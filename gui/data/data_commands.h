@@ -46,7 +46,10 @@ bool ImportCsvCommand(QWidget* parent, const DataTarget& target);
 bool TransferCommand(QWidget* parent, const DataTarget& target, bool move, bool all);
 // The same once the target database has been chosen.
 bool TransferToFile(const DataTarget& target, bool move, bool all, const std::string& targetPath);
-// "Print Records..." / "Print Record...": the print dialog with preview.
+// "Print Records..." / "Print Record...": the print dialog with preview,
+// or, when the PrintCommand setting names one, that command run on the
+// listing's file as the command-line tool's print does.
+inline constexpr char kPrintCommandSetting[] = "PrintCommand";
 bool PrintCommand(QWidget* parent, const DataTarget& target, bool all);
 // "Export Record..." / the listing of all records in view as text.
 bool ExportListingCommand(QWidget* parent, const DataTarget& target, bool all);

@@ -347,6 +347,18 @@ class DataDialogsTest : public QObject {
     QVERIFY(text2.contains("xEND"));
   }
 
+  void aPrintCommandSettingTakesTheListingInsteadOfTheDialog() {
+    TempDir dir;
+    Open o(CopySample("Orders", dir.path()));
+    auto settings = OpenDesktopSettings();
+    settings->Set(gui::kPrintCommandSetting, "true --ignored");
+    gui::DataTarget target = o.Target();
+    const bool printed = gui::PrintCommand(nullptr, target, true);
+    settings->Remove(gui::kPrintCommandSetting);
+    QVERIFY(printed);
+    QCOMPARE(o.ui.messages.back().text, std::string("Data Printed OK"));
+  }
+
   void everyDialogHasItsHelpSectionAndPicture() {
     for (const char* anchor : {"Sort_Dialog", "Filter_Dialog", "Find_Dialog", "Report_Dialog", "Csv_Export",
                                "Transfer_Records", "Print_Records", "Beam_Dialog", "Receive_Window"}) {

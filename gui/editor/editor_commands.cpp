@@ -192,14 +192,14 @@ void EditorCommands::RunEditor(size_t record, bool viewOnly, std::optional<size_
   UpdateActions();
   if (dialog.exitKind() == RecordEditorDialog::Exit::FollowLink) {
     const size_t at = dialog.record();
-    if (!Follow(*doc, at, dialog.linkField()) && at < doc->db().recordCount()) {
+    if (!Follow(*doc, at, dialog.linkField(), viewOnly) && at < doc->db().recordCount()) {
       // The link led nowhere (the user has been told): back to the record.
       RunEditor(at, viewOnly);
     }
   }
 }
 
-bool EditorCommands::Follow(Document& doc, size_t record, int field) {
+bool EditorCommands::Follow(Document& doc, size_t record, int field, bool viewOnly) {
   if (record >= doc.db().recordCount() || field < 0 || field >= format::kFieldCount) return false;
   const FieldDef& def = doc.db().schema().field[field];
   std::string otherPath = def.text.str();
@@ -219,16 +219,23 @@ bool EditorCommands::Follow(Document& doc, size_t record, int field) {
   Pending pending;
   pending.field = field;
   pending.record = record;
+  pending.viewOnly = viewOnly;
   std::optional<size_t> select;
   switch (def.type()) {
     case FieldType::Link:
       pending.mode = LevelMode::Browse;
       break;
     case FieldType::DBPopup:
+      if (viewOnly) return false;
       pending.mode = LevelMode::Choose;
       linked = Unrestricted(std::move(linked));
       break;
     case FieldType::Linked: {
+      if (viewOnly) {
+        // Only shown: the record it is linked to, nothing to choose.
+        pending.mode = LevelMode::Browse;
+        break;
+      }
       // Linked to nothing yet: choose the record; otherwise show where it
       // is linked, and a tap elsewhere offers to move it there.
       const uint32_t number = linked.restriction().value;
@@ -303,8 +310,8 @@ void EditorCommands::ResumeAfterLinkedLevel() {
     doc->SetCurrentRecord(record);
     if (out.stored) doc->ViewChangedExternally(false);
   }
-  const Access access = CheckAccess(doc->db(), secured::kEditRecords, doc->session().ui, false);
-  RunEditor(record, access != Access::Granted);
+  // Back to the editor as it was: the access was checked when it opened.
+  RunEditor(record, closed->viewOnly);
 }
 
 void EditorCommands::LevelPopped(int level, Document&) {

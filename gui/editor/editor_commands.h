@@ -53,13 +53,14 @@ class EditorCommands : public QObject, private WorkspaceListener {
     int field = -1;        // the field of the record beneath
     size_t record = 0;     // the record beneath
     LevelMode mode = LevelMode::Browse;
+    bool viewOnly = false; // the editor it came from could only show
     bool chosen = false;   // a value was handed back
     uint32_t number = 0;   // Linked: the number chosen
     std::string text;      // DB Popup and Linked: the text chosen
   };
 
   void RunEditor(size_t record, bool viewOnly, std::optional<size_t> copyFrom = std::nullopt);
-  bool Follow(Document& doc, size_t record, int field);
+  bool Follow(Document& doc, size_t record, int field, bool viewOnly);
   void HandBack(Document& doc, size_t chosen);
   bool InPlace(Document& doc, size_t record, int field, const QPoint& cell);
   void UpdateActions();

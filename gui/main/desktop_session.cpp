@@ -25,6 +25,7 @@ DesktopSession::DesktopSession(std::unique_ptr<Settings> settings, std::string d
   ui_.SetStartFolder(QString::fromStdString(context_.dataFolder));
   workspace_ = std::make_unique<Workspace>(context_);
   window_ = std::make_unique<MainWindow>(*workspace_, ui_);
+  window_->SetSettings(settings_.get());
 }
 
 bool DesktopSession::Start(const std::vector<std::string>& files, bool showWindow) {

@@ -17,6 +17,7 @@
 
 #include "app/commands.h"
 #include "app/document.h"
+#include "platform/settings.h"
 
 class QAction;
 class QDialog;
@@ -39,6 +40,10 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   Workspace& workspace() { return workspace_; }
   AppContext& context() { return workspace_.context(); }
   QtUiPort& ui() { return ui_; }
+  // The program's settings store (the preferences' own, so that tests and
+  // screenshots never touch the user's); null until the session sets it.
+  Settings* settings() const { return settings_; }
+  void SetSettings(Settings* settings) { settings_ = settings; }
   // The document of the shown level; null when nothing is open.
   Document* document() { return workspace_.shown(); }
   // Reads rows and columns again and selects the current record.
@@ -152,6 +157,7 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
 
   Workspace& workspace_;
   QtUiPort& ui_;
+  Settings* settings_ = nullptr;
   Document* attached_ = nullptr;
   QLabel* title_ = nullptr;
   QLabel* status_ = nullptr;

@@ -2,6 +2,9 @@
 // when they ask the user something.
 #include <QApplication>
 #include <QCursor>
+#include <QFile>
+#include <QRegularExpression>
+#include <QScrollBar>
 #include <QGuiApplication>
 #include <QTest>
 #include <QTextBrowser>
@@ -14,6 +17,19 @@
 #include "modal_answer.h"
 
 using cx::gui::QtUiPort;
+
+namespace {
+// The id of the help file's last section (the furthest from the top).
+QString LastSectionId() {
+  QFile file(QStringLiteral(":/help/cardovex.html"));
+  if (!file.open(QIODevice::ReadOnly)) return QString();
+  const QString html = QString::fromUtf8(file.readAll());
+  QString last;
+  QRegularExpression id(QStringLiteral("<h2 id=\"([A-Za-z_]+)\""));
+  for (auto it = id.globalMatch(html); it.hasNext();) last = it.next().captured(1);
+  return last;
+}
+}  // namespace
 using cx::gui::testing::ModalAnswer;
 
 class TestQtUiPort : public QObject {
@@ -146,10 +162,16 @@ class TestQtUiPort : public QObject {
     QVERIFY(browser);
     QCOMPARE(browser->source().fragment(), QStringLiteral("Preferences_Dialog"));
     QVERIFY(browser->toPlainText().contains(QStringLiteral("Allow Checkbox selection in List View")));
-    // A second request reuses the window.
+    // A second request reuses the window and scrolls to the section; a
+    // section named by its heading's id alone is found too.
     cx::gui::ShowHelp(&owner, QStringLiteral("Main_Contents"));
     QCOMPARE(owner.findChildren<QTextBrowser*>().size(), 1);
     QCOMPARE(browser->source().fragment(), QStringLiteral("Main_Contents"));
+    const int top = browser->verticalScrollBar()->value();
+    const QString last = LastSectionId();
+    QVERIFY(!last.isEmpty());
+    cx::gui::ShowHelp(&owner, last);
+    QVERIFY(cx::gui::testing::WaitFor([&] { return browser->verticalScrollBar()->value() > top + 200; }, 2000));
   }
 };
 

@@ -1,6 +1,6 @@
 #include "gui/main/desktop_session.h"
 
-#include <QDir>
+#include <QByteArray>
 
 #include "gui/main/record_list_view.h"
 #include "platform/data_folder.h"
@@ -10,6 +10,9 @@
 namespace cx::gui {
 
 namespace {
+// Where the window was and how large, beside the preferences.
+constexpr const char* kGeometryValue = "WindowGeometry";
+
 std::unique_ptr<Settings> OrDesktopSettings(std::unique_ptr<Settings> settings) {
   return settings ? std::move(settings) : OpenDesktopSettings();
 }
@@ -34,6 +37,9 @@ bool DesktopSession::Start(const std::vector<std::string>& files, bool showWindo
   // as a save that fails, with its message.
   MakeDirectories(context_.dataFolder);
   preferences_.Read();
+  if (auto geometry = settings_->Get(kGeometryValue)) {
+    window_->restoreGeometry(QByteArray::fromBase64(QByteArray::fromStdString(*geometry)));
+  }
   if (showWindow) window_->show();
   const bool open = workspace_->Start(files);
   window_->RebuildList();
@@ -46,6 +52,7 @@ void DesktopSession::Shutdown() {
   shutDown_ = true;
   workspace_->Shutdown();
   preferences_.Write();
+  settings_->Set(kGeometryValue, window_->saveGeometry().toBase64().toStdString());
 }
 
 }  // namespace cx::gui

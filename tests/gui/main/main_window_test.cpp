@@ -355,6 +355,7 @@ class TestMainWindow : public QObject {
     s.Shutdown();
     QCOMPARE(s.settings().Get("AllowPopups"), std::optional<std::string>("1"));
     QCOMPARE(s.settings().Get("AutoSave"), std::optional<std::string>("0"));
+    QVERIFY(s.settings().Get("WindowGeometry").has_value());
   }
 
   void reopenNamesKeepTheirAmpersands() {

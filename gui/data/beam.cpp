@@ -4,6 +4,7 @@
 #include <QDialog>
 #include <QDialogButtonBox>
 #include <QLabel>
+#include <QLineEdit>
 #include <QMessageBox>
 #include <QMetaObject>
 #include <QProgressDialog>
@@ -197,6 +198,7 @@ std::vector<std::string> ChooseBeamPeers(QWidget* parent, Settings& settings) {
   peer->setEditable(true);
   peer->setMinimumWidth(260);
   for (const std::string& p : RememberedPeers(remembered)) peer->addItem(QString::fromStdString(p));
+  peer->lineEdit()->setPlaceholderText("for example 192.168.1.20:6500");
   layout->addWidget(peer);
   auto* buttons = new QDialogButtonBox(QDialogButtonBox::Ok | QDialogButtonBox::Cancel, &dialog);
   buttons->button(QDialogButtonBox::Ok)->setText("Beam");

@@ -146,6 +146,7 @@ class EditorTest : public QObject {
   void dbPopupChoosesFromTheOtherDatabase();
   void missingLinkedDatabaseSaysSoAndReturns();
   void linkedRecordIsReassigned();
+  void movedRecordClosesTheEditor();
   void viewOnlyRefusesEdits();
   void pageDownKeepsTheEditsAndMovesOn();
   void imageEditorKeepsUntouchedPicturesAndDraws();
@@ -434,6 +435,26 @@ void EditorTest::linkedRecordIsReassigned() {
   const size_t now = desk.doc().currentRecord();
   QCOMPARE(ValueNumber(desk.Value(now, customer)), newNumber);
   QVERIFY(!ValueString(desk.Value(now, customer).subspan(24)).empty());
+}
+
+void EditorTest::movedRecordClosesTheEditor() {
+  Desk desk;
+  const QString twin = desk.dir.filePath(QStringLiteral("Twin.PDB"));
+  QVERIFY(QFile::copy(QString::fromStdString(desk.Path("Contacts")), twin));
+  QFile::setPermissions(twin, QFileDevice::ReadOwner | QFileDevice::WriteOwner);
+  QVERIFY(desk.Open("Contacts"));
+  const size_t before = desk.doc().db().recordCount();
+  desk.ui.fileAnswers = {twin.toStdString()};
+  RecordEditorDialog editor(desk.doc(), desk.doc().recordAt(0), false, nullptr, &desk.window);
+  editor.show();
+  editor.action(QStringLiteral("Move Record To..."))->trigger();
+  QCOMPARE(editor.exitKind(), RecordEditorDialog::Exit::Moved);
+  QVERIFY(!editor.isVisible());
+  QCOMPARE(desk.doc().db().recordCount(), before - 1);
+  QCOMPARE(desk.doc().rowCount(), before - 1);
+  Database target;
+  QVERIFY(target.Open(twin.toStdString(), desk.ui).ok());
+  QCOMPARE(target.recordCount(), before + 1);
 }
 
 void EditorTest::viewOnlyRefusesEdits() {

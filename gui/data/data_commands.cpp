@@ -109,10 +109,10 @@ void RecalculateCommand(QWidget*, const DataTarget& t) {
 }
 
 void RunReportCommand(QWidget* parent, const DataTarget& t, int field) {
-  const bool fromHeader = field >= 0;
+  int last = field;
   for (;;) {
     if (field < 0) {
-      ReportChooserDialog chooser(t.session.db, -1, parent);
+      ReportChooserDialog chooser(t.session.db, last, parent);
       if (chooser.exec() != QDialog::Accepted || chooser.field() < 0) return;
       field = chooser.field();
     }
@@ -124,7 +124,8 @@ void RunReportCommand(QWidget* parent, const DataTarget& t, int field) {
     if (!text) return;
     ReportResultsDialog results(*text, parent);
     if (results.exec() != ReportResultsDialog::kNewReport) return;
-    (void)fromHeader;
+    // "New Report" offers the field choice again, on the field just shown.
+    last = field;
     field = -1;
   }
 }

@@ -6,6 +6,7 @@
 
 #include <QObject>
 #include <QPointer>
+#include <QProgressDialog>
 #include <QTemporaryDir>
 #include <QTimer>
 #include <atomic>
@@ -17,7 +18,6 @@
 #include "infrared/beam_transfer.h"
 #include "platform/settings.h"
 
-class QProgressDialog;
 class QWidget;
 
 namespace cx::gui {
@@ -39,8 +39,8 @@ class BeamSession : public QObject {
   Outcome outcome() const { return outcome_; }
   // The device-search window's Cancel: the search stops and nothing is said.
   void CancelSearch();
-  QProgressDialog* searchWindow() const { return search_; }
-  QProgressDialog* progressWindow() const { return progress_; }
+  QProgressDialog* searchWindow() const { return search_.data(); }
+  QProgressDialog* progressWindow() const { return progress_.data(); }
 
  signals:
   void finished(cx::gui::BeamSession::Outcome outcome);
@@ -69,8 +69,10 @@ class BeamSession : public QObject {
   size_t next_ = 0;
   std::chrono::steady_clock::time_point started_;
   QTimer poll_;
-  QProgressDialog* search_ = nullptr;
-  QProgressDialog* progress_ = nullptr;
+  // Children of the window they belong to: they go with it if it closes
+  // first.
+  QPointer<QProgressDialog> search_;
+  QPointer<QProgressDialog> progress_;
   std::atomic<bool> cancelled_{false};
   Outcome outcome_ = Outcome::Running;
 };

@@ -65,7 +65,12 @@ ReceiveWindow* ReceiveCommand(QWidget* parent, Settings& settings, const std::st
 // through the document's listeners.
 DataTarget TargetFor(cx::Document& doc);
 // "Receive Via Infrared..." for the main window: the database on screen
-// is asked of `shown` each time something arrives.
-ReceiveWindow* ReceiveForWindow(QWidget* window, cx::AppContext& context, std::function<cx::Document*()> shown);
+// is asked of `shown` each time something arrives. `settings` null: the
+// desktop's own settings store.
+ReceiveWindow* ReceiveForWindow(QWidget* window, cx::AppContext& context, std::function<cx::Document*()> shown,
+                                Settings* settings = nullptr);
+// The beaming commands for the main window, with its settings store (null:
+// the desktop's own).
+BeamSession* BeamForWindow(QWidget* window, cx::Document& doc, Settings* settings, obex::BeamWhat what);
 
 }  // namespace cx::gui

@@ -13,11 +13,13 @@ DataTarget TargetFor(Document& doc) {
   return t;
 }
 
-ReceiveWindow* ReceiveForWindow(QWidget* window, AppContext& context, std::function<Document*()> shown) {
-  // The window keeps its settings store for as long as it lives.
-  Settings* settings = OpenDesktopSettings().release();
+ReceiveWindow* ReceiveForWindow(QWidget* window, AppContext& context, std::function<Document*()> shown,
+                                Settings* settings) {
+  // Without a store of the caller's, the window keeps one of its own for as
+  // long as it lives.
+  Settings* own = settings ? nullptr : OpenDesktopSettings().release();
   ReceiveWindow* w = ReceiveCommand(
-      window, *settings, context.dataFolder, context.ui,
+      window, settings ? *settings : *own, context.dataFolder, context.ui,
       [shown] {
         Document* doc = shown();
         return doc ? &doc->session() : nullptr;
@@ -25,8 +27,13 @@ ReceiveWindow* ReceiveForWindow(QWidget* window, AppContext& context, std::funct
       [shown] {
         if (Document* doc = shown()) doc->ViewChangedExternally(false);
       });
-  QObject::connect(w, &QObject::destroyed, [settings] { delete settings; });
+  if (own) QObject::connect(w, &QObject::destroyed, [own] { delete own; });
   return w;
+}
+
+BeamSession* BeamForWindow(QWidget* window, Document& doc, Settings* settings, obex::BeamWhat what) {
+  std::unique_ptr<Settings> own = settings ? nullptr : OpenDesktopSettings();
+  return BeamCommand(window, TargetFor(doc), settings ? *settings : *own, what);
 }
 
 }  // namespace cx::gui

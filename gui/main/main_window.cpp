@@ -29,7 +29,6 @@
 #include "gui/main/record_list_model.h"
 #include "gui/main/record_list_view.h"
 #include "gui/main/start_dialog.h"
-#include "platform/qt/qt_platform.h"
 
 namespace cx::gui {
 
@@ -606,15 +605,13 @@ void MainWindow::printRecords() {
   if (Document* doc = document()) PrintCommand(this, TargetFor(*doc), /*all=*/true);
 }
 void MainWindow::beamRecords() {
-  auto settings = OpenDesktopSettings();
-  if (Document* doc = document()) BeamCommand(this, TargetFor(*doc), *settings, obex::BeamWhat::kRecordsInView);
+  if (Document* doc = document()) BeamForWindow(this, *doc, settings_, obex::BeamWhat::kRecordsInView);
 }
 void MainWindow::beamDatabase() {
-  auto settings = OpenDesktopSettings();
-  if (Document* doc = document()) BeamCommand(this, TargetFor(*doc), *settings, obex::BeamWhat::kDatabase);
+  if (Document* doc = document()) BeamForWindow(this, *doc, settings_, obex::BeamWhat::kDatabase);
 }
 void MainWindow::receiveViaInfrared() {
-  ReceiveForWindow(this, context(), [this] { return document(); });
+  ReceiveForWindow(this, context(), [this] { return document(); }, settings_);
 }
 
 }  // namespace cx::gui

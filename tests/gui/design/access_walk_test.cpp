@@ -11,6 +11,13 @@
 #include "design/security.h"
 #include "gui/design/design_commands.h"
 #include "gui/design/field_editor_dialog.h"
+#ifdef CARDOVEX_WALK_EDITOR
+#include "gui/editor/editor_commands.h"
+#endif
+#ifdef CARDOVEX_WALK_DATA
+#include "gui/data/data_commands.h"
+#include "gui/data/data_util.h"
+#endif
 #include "platform/settings.h"
 #include "tests/design/design_db.h"
 #include "tests/gui/design/design_gui_support.h"
@@ -27,8 +34,14 @@ enum Typed { kNothing, kWrongCase, kRight };
 struct Site {
   const char* name;
   int operation;
-  // Runs the command on the shown document; true when the guarded work ran.
-  std::function<bool(Workspace&, const std::string& path)> run;
+  // Runs the command; true when the guarded work ran. `guarded` is the
+  // file whose level is set, `plain` an unprotected one of the same design.
+  std::function<bool(Workspace&, const std::string& guarded, const std::string& plain)> run;
+  // The workspace shows the plain database (the guarded one is the other
+  // side of the work) rather than the guarded one.
+  bool showsPlain = false;
+  // How often one run asks: a move asks the delete check once per record.
+  int checksPerRun = 1;
 };
 
 // A dialog command ran when its dialog showed (it is then cancelled).
@@ -36,7 +49,8 @@ bool ShowsDialog(const char* dialog, const std::function<void()>& command) {
   bool shown = false;
   OnModal(QString::fromLatin1(dialog), [&shown](QWidget* w) {
     shown = true;
-    Press(w, QDialogButtonBox::Cancel);
+    // A read-only record editor has no Cancel button.
+    if (auto* d = qobject_cast<QDialog*>(w)) d->reject();
   });
   command();
   StopModalWatchers();
@@ -46,38 +60,66 @@ bool ShowsDialog(const char* dialog, const std::function<void()>& command) {
 const std::vector<Site>& Sites() {
   static const std::vector<Site> sites = {
       {"open", secured::kOpenDatabase,
-       [](Workspace& ws, const std::string& path) { return ws.Open(path); }},
+       [](Workspace& ws, const std::string& path, const std::string&) { return ws.Open(path); }},
       {"delete records", secured::kDeleteRecords,
-       [](Workspace& ws, const std::string&) {
+       [](Workspace& ws, const std::string&, const std::string&) {
          // The main window asks before its dialog, then deletes.
          if (!CommandAllowed(Command::DeleteRecords, *ws.shown(), ws.context().ui)) return false;
          return ws.shown()->DeleteRecords(DeleteScope::All) > 0;
        }},
       {"db properties", secured::kDBProperties,
-       [](Workspace& ws, const std::string&) {
+       [](Workspace& ws, const std::string&, const std::string&) {
          return ShowsDialog("editDatabaseDialog",
                             [&] { ShowDatabaseProperties(nullptr, *ws.shown()); });
        }},
       {"field properties", secured::kDBProperties,
-       [](Workspace& ws, const std::string&) {
+       [](Workspace& ws, const std::string&, const std::string&) {
          return ShowsDialog("editFieldDialog",
                             [&] { ShowFieldProperties(nullptr, *ws.shown(), 0); });
        }},
       {"security access", secured::kDBProperties,
-       [](Workspace& ws, const std::string&) {
+       [](Workspace& ws, const std::string&, const std::string&) {
          return ShowsDialog("securityAccessDialog",
                             [&] { ShowSecurityAccess(nullptr, *ws.shown()); });
        }},
       {"edit popup list", secured::kEditPopups,
-       [](Workspace& ws, const std::string&) {
+       [](Workspace& ws, const std::string&, const std::string&) {
          return ShowsDialog("popupListDialog", [&] { EditPopupList(nullptr, *ws.shown(), 0); });
        }},
       {"field editor's edit popups", secured::kEditPopups,
-       [](Workspace& ws, const std::string&) {
+       [](Workspace& ws, const std::string&, const std::string&) {
          FieldEditorDialog editor(ws.shown()->session(), 0);
          return ShowsDialog("popupListDialog",
                             [&] { editor.findChild<QPushButton*>("editPopups")->click(); });
        }},
+#ifdef CARDOVEX_WALK_EDITOR
+      {"new record", secured::kAddRecords,
+       [](Workspace& ws, const std::string&, const std::string&) {
+         QWidget window;
+         EditorCommands commands(&window, ws);
+         return ShowsDialog("recordEditor", [&] { commands.NewRecord(); });
+       }},
+      {"open record", secured::kEditRecords,
+       [](Workspace& ws, const std::string&, const std::string&) {
+         QWidget window;
+         EditorCommands commands(&window, ws);
+         return ShowsDialog("recordEditor", [&] { commands.OpenRecordAt(0, 1, QPoint()); });
+       }},
+#endif
+#ifdef CARDOVEX_WALK_DATA
+      {"copy records, target", secured::kAddRecords,
+       [](Workspace& ws, const std::string& guarded, const std::string&) {
+         return TransferToFile(DataTarget(ws.shown()->session()), false, true, guarded);
+       },
+       true},
+      {"move records, source", secured::kDeleteRecords,
+       [](Workspace& ws, const std::string&, const std::string& plain) {
+         // Refused, a move still copies: it ran when records left the source.
+         TransferToFile(DataTarget(ws.shown()->session()), true, true, plain);
+         return ws.shown()->db().recordCount() == 0;
+       },
+       false, 2},
+#endif
   };
   return sites;
 }
@@ -115,14 +157,15 @@ class AccessWalkTest : public QObject {
     const Site& s = Sites()[static_cast<size_t>(site)];
 
     const std::string path = dir_.File("guarded.PDB");
-    {
-      Database db = MakeDatabase(path, {{"Colour", FieldType::PopUp}});
+    const std::string plain = dir_.File("plain.PDB");
+    for (const std::string& file : {path, plain}) {
+      Database db = MakeDatabase(file, {{"Colour", FieldType::PopUp}, {"Name", FieldType::Text}});
       db.popups()[0].items = {"Red", "Blue"};
-      AddRecord(db, {"0"});
-      AddRecord(db, {"1"});
+      AddRecord(db, {"0", "first"});
+      AddRecord(db, {"1", "second"});
       db.schema().password.set("Secret");
-      SetLevel(db.schema(), s.operation, level);
-      QVERIFY(db.SaveAs(path).ok());
+      if (file == path) SetLevel(db.schema(), s.operation, level);
+      QVERIFY(db.SaveAs(file).ok());
     }
 
     ScriptedUi ui;
@@ -132,13 +175,15 @@ class AccessWalkTest : public QObject {
     RecentFiles recent(settings);
     AppContext context{ui, locale, preferences, recent, dir_.path()};
     Workspace workspace(context);
-    if (s.operation != secured::kOpenDatabase) QVERIFY(workspace.Open(path));
+    if (s.operation != secured::kOpenDatabase) QVERIFY(workspace.Open(s.showsPlain ? plain : path));
     ui.messages.clear();
     ui.passwordPrompts = 0;
-    if (typed == kWrongCase) ui.passwordAnswers = {{"SECRET"}};
-    if (typed == kRight) ui.passwordAnswers = {{"Secret"}};
+    for (int i = 0; i < s.checksPerRun; ++i) {
+      if (typed == kWrongCase) ui.passwordAnswers.push_back({"SECRET"});
+      if (typed == kRight) ui.passwordAnswers.push_back({"Secret"});
+    }
 
-    const bool ran = s.run(workspace, path);
+    const bool ran = s.run(workspace, path, plain);
 
     // Opening knows no "view only": any level but the first two refuses.
     const bool viewOnlyGrants = s.operation != secured::kOpenDatabase;
@@ -146,7 +191,7 @@ class AccessWalkTest : public QObject {
                     (level == access_level::kViewOnly && viewOnlyGrants) ||
                     (level == access_level::kPassword && typed == kRight);
     QCOMPARE(ran, expected);
-    QCOMPARE(ui.passwordPrompts, level == access_level::kPassword ? 1 : 0);
+    QCOMPARE(ui.passwordPrompts, level == access_level::kPassword ? s.checksPerRun : 0);
 
     auto said = [&ui](const char* text) {
       for (const auto& m : ui.messages) {

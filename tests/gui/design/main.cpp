@@ -6,6 +6,9 @@ int RunDatabaseDialogsTest(int argc, char** argv);
 int RunCliEquivalenceTest(int argc, char** argv);
 int RunNewDatabaseDesignTest(int argc, char** argv);
 int RunAccessWalkTest(int argc, char** argv);
+#ifdef CARDOVEX_WALK_MAIN
+int RunMainWindowDesignTest(int argc, char** argv);
+#endif
 
 int main(int argc, char** argv) {
   if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM")) qputenv("QT_QPA_PLATFORM", "offscreen");
@@ -20,5 +23,8 @@ int main(int argc, char** argv) {
   failed += RunCliEquivalenceTest(argc, argv);
   failed += RunNewDatabaseDesignTest(argc, argv);
   failed += RunAccessWalkTest(argc, argv);
+#ifdef CARDOVEX_WALK_MAIN
+  failed += RunMainWindowDesignTest(argc, argv);
+#endif
   return failed == 0 ? 0 : 1;
 }

@@ -10,6 +10,7 @@
 #include <QSignalBlocker>
 #include <QToolButton>
 #include <QVBoxLayout>
+#include <filesystem>
 
 #include "design/field_controls.h"
 #include "design/security.h"
@@ -269,7 +270,15 @@ void FieldEditorDialog::OnEditPopups() {
 }
 
 void FieldEditorDialog::OnPickOtherDatabase() {
-  auto path = session_.ui.AskOpenFile(kOpenTitle, kOpenFilter);
+  FileDialogRequest request;
+  request.title = kOpenTitle;
+  request.filter = kOpenFilter;
+  // Linked databases usually sit beside this one.
+  const std::string& own = session_.db.path();
+  if (own.find('*') == std::string::npos) {
+    request.folder = std::filesystem::path(own).parent_path().string();
+  }
+  auto path = session_.ui.ChooseOpenFile(request);
   if (!path) return;
   FieldSettings s;
   if (PickOtherDatabase(*path, s)) otherDatabase_->setText(FromDb(s.otherDatabase));

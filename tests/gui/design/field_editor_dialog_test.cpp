@@ -10,7 +10,6 @@
 
 #include "design/security.h"
 #include "design/type_change.h"
-#include "engine/value_text.h"
 #include "gui/design/field_editor_dialog.h"
 #include "gui/design/popup_list_dialog.h"
 #include "tests/design/design_db.h"
@@ -194,21 +193,6 @@ class FieldEditorDialogTest : public QObject {
     QCOMPARE(Find<QLineEdit>(&again, "pixelsShown")->text(), shownAgain);
   }
 
-  void maxCharactersAndOtherFieldClamps() {
-    Database db = MakeDatabase(dir_.File("m.PDB"), {{"F", FieldType::DBPopup}});
-    DataSession session(db, locale_, ui_);
-    FieldEditorDialog dialog(session, 0);
-    Find<QLineEdit>(&dialog, "maxCharacters")->setText("999");
-    Find<QLineEdit>(&dialog, "otherField")->setText("31");
-    Find<QLineEdit>(&dialog, "group")->setText("-5");
-    dialog.accept();
-    QCOMPARE(int(db.schema().field[0].size), 254);
-    QCOMPARE(int(db.schema().field[0].otherField), 0);
-    QCOMPARE(int(db.schema().field[0].param3), 0);
-    FieldEditorDialog again(session, 0);
-    QCOMPARE(Find<QLineEdit>(&again, "otherField")->text(), QStringLiteral("1"));
-  }
-
   // A No to the data-loss question stores nothing: saved again, the file
   // is the same byte for byte.
   void integerToPopUpNoLeavesTheFileAsItWas() {
@@ -276,20 +260,6 @@ class FieldEditorDialogTest : public QObject {
     QCOMPARE(QGuiApplication::overrideCursor(), nullptr);
   }
 
-  void textToUniqueYesKeepsTheNumbers() {
-    Database db = MakeFilled();
-    DataSession session(db, locale_, ui_);
-    ui_.yesNoAnswers = {true};
-    FieldEditorDialog dialog(session, 3);
-    Find<QComboBox>(&dialog, "type")->setCurrentIndex(int(FieldType::Unique));
-    dialog.accept();
-    QVERIFY(dialog.recordsChanged());
-    std::vector<std::string> values;
-    const ValueContext ctx{db.schema(), db.popups(), locale_};
-    for (size_t r = 0; r < db.recordCount(); ++r) values.push_back(ValueText(ctx, db.record(r), 3));
-    QCOMPARE(values, (std::vector<std::string>{"7", "0", "3"}));
-  }
-
   // Picking Pop-Up anew selects "No Value"; Edit Popups refills the list.
   void defaultValueFollowsThePopupEditor() {
     Database db = MakeFilled();
@@ -351,6 +321,8 @@ class FieldEditorDialogTest : public QObject {
     ui_.fileAnswers = {other, dir_.File("missing.PDB")};
     Find<QToolButton>(&dialog, "pickOtherDatabase")->click();
     QCOMPARE(Find<QLineEdit>(&dialog, "otherDatabase")->text(), QStringLiteral("Stored Name"));
+    QCOMPARE(ui_.openRequests.at(0).title, std::string("Cardovex"));
+    QCOMPARE(ui_.openRequests.at(0).folder, dir_.path());
     Find<QToolButton>(&dialog, "pickOtherDatabase")->click();
     QCOMPARE(Find<QLineEdit>(&dialog, "otherDatabase")->text(), QStringLiteral("Stored Name"));
   }

@@ -70,13 +70,17 @@ std::string Hex32(uint32_t v) {
   return buf;
 }
 
+uint32_t NameHash(const std::string& name) {
+  uint32_t hash = 2166136261u;
+  for (unsigned char c : name) hash = (hash ^ c) * 16777619u;
+  return hash;
+}
+
 // Temporary names are "." + the target's name (cut to fit) + "." + a hash
 // of the whole name + "-" + the writer's process id + "-" + a random part
 // + ".tmp". The hash keeps two long names that share their first bytes
 // apart; the process id tells whether the writer is still alive.
 std::string TemporaryPrefix(const std::string& targetName, size_t nameLimit) {
-  uint32_t hash = 2166136261u;
-  for (unsigned char c : targetName) hash = (hash ^ c) * 16777619u;
   // Room for ".", ".", 8 hex digits, "-", a process id, "-", 6 digits, ".tmp".
   constexpr size_t kOverhead = 1 + 1 + 8 + 1 + 10 + 1 + 6 + 4;
   size_t keep = nameLimit > kOverhead + 1 ? nameLimit - kOverhead : 1;
@@ -87,7 +91,7 @@ std::string TemporaryPrefix(const std::string& targetName, size_t nameLimit) {
       base.pop_back();
     }
   }
-  return "." + base + "." + Hex32(hash) + "-";
+  return "." + base + "." + Hex32(NameHash(targetName)) + "-";
 }
 
 bool ProcessIsGone(long pid) {
@@ -255,9 +259,13 @@ bool ResolveLinks(const std::string& path, std::string& resolved) {
 }
 
 bool IsTemporaryNameFor(const std::string& targetName, const std::string& name) {
-  const std::string prefix = TemporaryPrefix(targetName, 255);
-  return name.size() > prefix.size() + 4 && name.compare(0, prefix.size(), prefix) == 0 &&
-         name.compare(name.size() - 4, 4, ".tmp") == 0;
+  // Whatever the folder's length limit cut the name to.
+  const std::string tag = "." + Hex32(NameHash(targetName)) + "-";
+  const size_t at = name.rfind(tag);
+  if (name.size() < 5 || name[0] != '.' || at == std::string::npos || at < 1) return false;
+  const size_t baseLength = at - 1;
+  return baseLength <= targetName.size() && name.compare(1, baseLength, targetName, 0, baseLength) == 0 &&
+         name.size() > at + tag.size() + 4 && name.compare(name.size() - 4, 4, ".tmp") == 0;
 }
 
 SafeFileWriter::SafeFileWriter(std::string target, bool sync)

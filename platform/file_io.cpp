@@ -31,7 +31,6 @@ std::string DirectoryOf(const std::string& path) {
   return path.substr(0, slash);
 }
 
-
 FileState StateOf(const struct stat& st) {
   FileState f;
   f.device = static_cast<uint64_t>(st.st_dev);

@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "cli/args.h"
 #include "cli/command.h"
@@ -12,7 +13,12 @@
 
 namespace cx::cli {
 
-// Opens `path` into `db` as the program does: the "Open Database" access
+// Locks the databases at `paths` for the rest of the command, waiting a
+// while for another command that holds one. False after printing the
+// message when one stays busy. Files that do not exist are not locked.
+bool LockDatabases(Context& ctx, const std::vector<std::string>& paths);
+
+// Opens `path` into `db` as the program does (after locking it): the "Open Database" access
 // check (asking for --password where the file requires it), the open with
 // its messages, and the recalculation or re-sort the file still owes. On
 // failure the message has gone to stderr and the result is false.

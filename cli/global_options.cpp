@@ -1,5 +1,7 @@
 #include "cli/global_options.h"
 
+#include <cerrno>
+#include <cstring>
 #include <ostream>
 #include <sstream>
 
@@ -160,6 +162,20 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
   std::vector<std::string> commandArgs(rest.begin() + 1, rest.end());
   int code = command->Run(ctx, commandArgs);
   if (code == kExitOk && ui.unanswered()) code = kExitFailed;
+  // Output that never arrived (a full disk, a closed pipe) is a failure,
+  // however well the rest went.
+  out.flush();
+  if (!out) {
+    // The stream only remembers that a write failed; one more try at what
+    // is still buffered brings back the reason.
+    out.clear();
+    errno = 0;
+    out.flush();
+    const int error = errno;
+    err << "cardovex-cli: the output could not be written"
+        << (error ? std::string(": ") + std::strerror(error) : std::string()) << "\n";
+    code = kExitFailed;
+  }
   return code;
 }
 

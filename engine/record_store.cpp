@@ -146,6 +146,7 @@ Status Database::Open(const std::string& path, UiPort& ui) {
                        "values are shown cut short and are kept as they are unless edited.",
                    "Error", MessageIcon::Warning);
   }
+  db.diskState_ = image->state();
   db.image_ = std::move(image);
   *this = std::move(db);
   return Status::Ok();
@@ -158,6 +159,10 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
     return Status::Error(
         "ERROR: This database could only be read in part.\nSave it under another name so that "
         "the original file is kept.");
+  }
+  if (diskState_ && SameFile(target, path_)) {
+    std::optional<FileState> now = StatFile(target);
+    if (now && *now != *diskState_) return Status::Error(FormatMessage(messages::kChangedOnDisk, target));
   }
   const size_t numRecords = format::kFirstDataRecord + records_.size();
   if (numRecords > format::kMaxFileRecords) return Status::Error("ERROR: Too many records to save");
@@ -212,9 +217,20 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
 
   header_ = header;
   path_ = target;
+  diskState_ = out.written();
   partial_ = false;
   changed_ = false;
   return Status::Ok();
+}
+
+bool Database::ChangedOnDisk() const {
+  if (!diskState_) return false;
+  std::optional<FileState> now = StatFile(path_);
+  return now && *now != *diskState_;
+}
+
+void Database::AcceptDiskState() {
+  if (std::optional<FileState> now = StatFile(path_)) diskState_ = now;
 }
 
 bool Database::InsertRecord(size_t position, Bytes stored, uint8_t attributes, uint32_t uniqueID) {

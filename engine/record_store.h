@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -13,6 +14,7 @@
 #include "engine/record_reader.h"
 #include "engine/schema.h"
 #include "platform/clock.h"
+#include "platform/file_io.h"
 #include "platform/status.h"
 #include "platform/ui_port.h"
 
@@ -58,9 +60,20 @@ class Database {
 
   // Writes the database to its path (or to `path`), never damaging the file
   // being replaced. On success the changed mark is cleared; on failure it
-  // stays, and the message is in the status.
+  // stays, and the message is in the status. The file this database was
+  // read from (or last saved to) is not replaced when it has changed on
+  // disk since then: another program's changes would be lost without a
+  // word. See ChangedOnDisk and AcceptDiskState.
   Status Save(const Clock& clock = DefaultClock());
   Status SaveAs(const std::string& path, const Clock& clock = DefaultClock());
+
+  // True when the file at path() is no longer the one this database was
+  // read from or last saved to (another program replaced or rewrote it).
+  bool ChangedOnDisk() const;
+  // Takes the file as it is now on disk as the one this database came
+  // from, so that the next save replaces it: for a caller whose user
+  // chose to keep this version over the other program's.
+  void AcceptDiskState();
 
   const std::string& path() const { return path_; }
   void SetPath(const std::string& path) { path_ = path; }
@@ -113,6 +126,8 @@ class Database {
   uint32_t schemaUniqueID_ = 0;
   std::vector<DataRecord> records_;
   FileImage image_;  // keeps the views of unchanged records alive
+  // The file as read or last written; nothing for a database not yet on disk.
+  std::optional<FileState> diskState_;
   uint32_t nextUnique_ = 0;  // 0: not yet computed
   bool changed_ = false;
   bool partial_ = false;
@@ -127,6 +142,9 @@ inline constexpr const char* kBadHeader =
 inline constexpr const char* kCannotInit = "Could not initialize file";
 inline constexpr const char* kCannotReadSchema = "Could not read file";
 inline constexpr const char* kCannotReadRecord = "ERROR:Reading Record: %d";
+inline constexpr const char* kChangedOnDisk =
+    "%s was changed by another program after it was opened here, so it was not replaced. "
+    "Open it again to see those changes.";
 }  // namespace messages
 
 // printf-style "%s"/"%d" substitution for the messages above.

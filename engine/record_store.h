@@ -42,6 +42,24 @@ class DataRecord {
   std::shared_ptr<const Bytes> owned_;
 };
 
+// What a database file holds before its data records. Commands that show
+// only the header, the schema or the popup lists need no more than this,
+// and reading it costs the same whatever the number of records.
+struct DatabaseHead {
+  Header header;
+  Schema schema = InitSchema();
+  PopupLists popups{};
+  uint8_t schemaAttributes = 0;
+  uint32_t schemaUniqueID = 0;
+  // How many data records the file's entry list announces (none are read).
+  size_t dataRecords = 0;
+};
+
+// Reads the head of a database file by the same rules as Database::Open,
+// but only the bytes before record 31. Nothing is shown: on failure the
+// status holds the message the open would show.
+Status ReadDatabaseHead(const std::string& path, DatabaseHead& head);
+
 class Database {
  public:
   Database();

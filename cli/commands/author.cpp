@@ -32,8 +32,14 @@ class AuthorCommand : public Command {
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     AuthorInfo info = LoadAuthorInfo(db.schema());
     if (args.has("--author") || args.has("--comments")) {
-      if (auto a = args.value("--author")) info.author = Utf8ToCp1252(*a);
-      if (auto c = args.value("--comments")) info.comments = Utf8ToCp1252(*c);
+      std::string error;
+      if (auto a = args.value("--author"); a && !ToStoredText(*a, "--author", info.author, error)) {
+        return UsageError(ctx, *this, error);
+      }
+      if (auto c = args.value("--comments");
+          c && !ToStoredText(*c, "--comments", info.comments, error)) {
+        return UsageError(ctx, *this, error);
+      }
       if (info.author.size() > 39) return UsageError(ctx, *this, "--author takes at most 39 characters");
       if (info.comments.size() > 69) return UsageError(ctx, *this, "--comments takes at most 69 characters");
       if (!PassAccessCheck(ctx, db, secured::kDBProperties)) return kExitFailed;

@@ -54,7 +54,10 @@ class SecurityCommand : public Command {
       settings.levels[op] = level;
     }
     if (auto pw = args.value("--set-password")) {
-      settings.password = Utf8ToCp1252(*pw);
+      std::string error;
+      if (!ToStoredText(*pw, "--set-password", settings.password, error)) {
+        return UsageError(ctx, *this, error);
+      }
       if (settings.password.size() > 19) {
         return UsageError(ctx, *this, "a password has at most 19 characters");
       }

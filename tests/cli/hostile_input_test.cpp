@@ -80,6 +80,33 @@ TEST_F(UnstorableText, QuestionMarkPasswordDoesNotOpenForOtherCharacters) {
   EXPECT_EQ(Cli({"--password", "??", "info", path}).code, 0);
 }
 
+TEST(CsvImportReport, CountsOnStderrAndStrictChangesNothing) {
+  testing::TempDir dir;
+  const std::string path = dir.File("Tasks.PDB");
+  ASSERT_EQ(Cli({"new", path, "--name", "Tasks", "--field", "Name:Text:size=8", "--field",
+                 "Done:Check-Box", "--field", "Due:Date"}).code, 0);
+  const std::string csv = dir.File("in.csv");
+  const std::string text = "Paint,1,3/1/2026\nSand,yes,3/2/2026\nA much longer name,0,\n"
+                           "Fix,0,someday\n\"Clean,1\n";
+  ASSERT_TRUE(WriteFileSafely(csv, text.data(), text.size()).ok());
+  const testing::ByteVector before = testing::ReadBytes(path);
+
+  Result strict = Cli({"import-csv", path, csv, "--strict"});
+  EXPECT_EQ(strict.code, 1);
+  EXPECT_EQ(testing::ReadBytes(path), before);
+  EXPECT_NE(strict.err.find("4 lines hold"), std::string::npos) << strict.err;
+
+  Result r = Cli({"import-csv", path, csv});
+  EXPECT_EQ(r.code, 0) << r.err;
+  EXPECT_EQ(r.out, "5 records imported\n");
+  EXPECT_EQ(r.err,
+            "import-csv: 4 lines hold values that are not stored as given:\n"
+            "  line 2, field \"Done\" (Check-Box): \"yes\" cannot be read\n"
+            "  line 3, field \"Name\" (Text): \"A much longer name\" was cut to 8 characters\n"
+            "  line 4, field \"Due\" (Date): \"someday\" cannot be read\n"
+            "  line 5: a quote is never closed, so the rest of the file became one value\n");
+}
+
 // The largest file the format allows: 65504 data records, the last offsets
 // close to 4 GB. Made sparse, so it costs no disk space; `info` must answer
 // from the head alone, within a memory limit far below the file's size.

@@ -154,17 +154,32 @@ Database Database::CreateNew(const std::string& path, const std::string& name) {
 }
 
 Status Database::Open(const std::string& path, UiPort& ui) {
+  auto image = std::make_shared<FileBuffer>();
+  if (!image->Read(path)) {
+    const std::string message = FormatMessage(messages::kCannotOpen, path);
+    ui.SetBusy(false);
+    ui.ShowMessage(message, "Error", MessageIcon::Error);
+    return Status::Error(message);
+  }
+  const ByteView bytes(image->data(), image->size());
+  return Load(path, RecordSource{std::move(image), bytes}, ui);
+}
+
+Status Database::OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui) {
+  const ByteView view = bytes ? ByteView(*bytes) : ByteView();
+  return Load(path, RecordSource{std::move(bytes), view}, ui);
+}
+
+Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) {
   auto fail = [&ui](std::string message) {
     ui.SetBusy(false);
     ui.ShowMessage(message, "Error", MessageIcon::Error);
     return Status::Error(std::move(message));
   };
 
-  auto image = std::make_shared<FileBuffer>();
-  if (!image->Read(path)) return fail(FormatMessage(messages::kCannotOpen, path));
   RecordReader reader;
   DatabaseHead head;
-  RecordSource source{image, ByteView(image->data(), image->size())};
+  std::shared_ptr<const void> image = source.owner;
   if (Status status = ReadHead(reader, std::move(source), head); !status) {
     return fail(status.message());
   }

@@ -73,6 +73,9 @@ class Database {
   // succeeds with the records before it; partial() then tells, and Save()
   // will not overwrite the original file.
   Status Open(const std::string& path, UiPort& ui);
+  // The same open of a file's bytes already in memory (a database that
+  // arrived from outside and is not stored yet), named `path`.
+  Status OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui);
 
   // Writes the database to its path (or to `path`), never damaging the file
   // being replaced. On success the changed mark is cleared; on failure it
@@ -123,6 +126,8 @@ class Database {
   std::string Name() const { return header_.Name(); }
 
  private:
+  Status Load(const std::string& path, RecordSource source, UiPort& ui);
+
   std::string path_;
   Header header_;
   Schema schema_;
@@ -130,7 +135,7 @@ class Database {
   uint8_t schemaAttributes_ = 0;
   uint32_t schemaUniqueID_ = 0;
   std::vector<DataRecord> records_;
-  FileImage image_;  // keeps the views of unchanged records alive
+  std::shared_ptr<const void> image_;  // keeps the views of unchanged records alive
   uint32_t nextUnique_ = 0;  // 0: not yet computed
   bool changed_ = false;
   bool partial_ = false;

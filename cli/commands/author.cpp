@@ -28,10 +28,15 @@ class AuthorCommand : public Command {
     Args args(argv, {"--author", "--comments"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
-    Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
-    AuthorInfo info = LoadAuthorInfo(db.schema());
-    if (args.has("--author") || args.has("--comments")) {
+    AuthorInfo info;
+    if (!args.has("--author") && !args.has("--comments")) {
+      DatabaseHead head;
+      if (!OpenHeadForCommand(ctx, args.positional()[0], head)) return kExitFailed;
+      info = LoadAuthorInfo(head.schema);
+    } else {
+      Database db;
+      if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+      info = LoadAuthorInfo(db.schema());
       std::string error;
       if (auto a = args.value("--author"); a && !ToStoredText(*a, "--author", info.author, error)) {
         return UsageError(ctx, *this, error);

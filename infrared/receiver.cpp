@@ -7,6 +7,7 @@
 #include <cstring>
 #include <list>
 #include <mutex>
+#include <system_error>
 
 #include "infrared/receive_store.h"
 #include "platform/tcp_transport.h"
@@ -94,13 +95,19 @@ Status RunReceiver(StreamTransport& transport, ObjectSink& sink, const ReceiverO
     }
     Session& session = sessions.emplace_back();
     session.peer = std::move(peer);
-    session.thread = std::thread([&session, &serial, &server, &mutex, &sessionEnded] {
-      ServeObexSession(*session.peer, serial, server);
-      session.peer->Interrupt();  // the peer hears at once that it is over
-      std::lock_guard<std::mutex> lock(mutex);
-      session.done = true;
-      sessionEnded.notify_all();
-    });
+    try {
+      session.thread = std::thread([&session, &serial, &server, &mutex, &sessionEnded] {
+        ServeObexSession(*session.peer, serial, server);
+        session.peer->Interrupt();  // the peer hears at once that it is over
+        std::lock_guard<std::mutex> lock(mutex);
+        session.done = true;
+        sessionEnded.notify_all();
+      });
+    } catch (const std::system_error&) {
+      // No thread to be had: this peer is turned away, the others go on.
+      session.peer->Close();
+      sessions.pop_back();
+    }
   }
   // Sessions still running finish on their own once enough objects have
   // arrived; when stopped (or failing) they are woken and end at once.

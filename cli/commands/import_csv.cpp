@@ -59,7 +59,7 @@ class ImportCsvCommand : public Command {
 void ImportCsvCommand::ReportIssues(Context& ctx, const Database& db, const CsvImportIssues& issues) {
   ctx.err << "import-csv: " << issues.lines << (issues.lines == 1 ? " line holds" : " lines hold")
           << " values that are not stored as given";
-  ctx.err << (issues.lines > issues.first.size() ? "; the first:\n" : ":\n");
+  ctx.err << (issues.lines > CsvImportIssues::kKeptLines ? "; the first of them:\n" : ":\n");
   for (const std::string& line : issues.Describe(db.schema())) {
     ctx.err << "  " << Cp1252ToUtf8(line) << "\n";
   }

@@ -96,6 +96,19 @@ TEST(CsvImportReport, CountsOnStderrAndStrictChangesNothing) {
   EXPECT_EQ(testing::ReadBytes(path), before);
   EXPECT_NE(strict.err.find("4 lines hold"), std::string::npos) << strict.err;
 
+  // More lines than are named: the count stays whole, the list stops.
+  std::string many;
+  for (int i = 0; i < 8; ++i) many += "T" + std::to_string(i) + ",maybe,\n";
+  const std::string manyCsv = dir.File("many.csv");
+  ASSERT_TRUE(WriteFileSafely(manyCsv, many.data(), many.size()).ok());
+  Result counted = Cli({"import-csv", path, manyCsv, "--strict"});
+  EXPECT_EQ(counted.code, 1);
+  EXPECT_NE(counted.err.find("8 lines hold values that are not stored as given; the first of them:\n"),
+            std::string::npos)
+      << counted.err;
+  EXPECT_NE(counted.err.find("line 5,"), std::string::npos);
+  EXPECT_EQ(counted.err.find("line 6,"), std::string::npos);
+
   Result r = Cli({"import-csv", path, csv});
   EXPECT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(r.out, "5 records imported\n");

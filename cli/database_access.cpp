@@ -60,6 +60,14 @@ bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session)
   return OpenDatabase(session, path).ok();
 }
 
+bool OpenHeadForCommand(Context& ctx, const std::string& path, DatabaseHead& head) {
+  if (Status read = ReadDatabaseHead(path, head); !read) {
+    ctx.ui.ShowMessage(read.message(), "Error", MessageIcon::Error);
+    return false;
+  }
+  return CheckOpenAccess(head.schema, ctx.ui);
+}
+
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path) {
   Status s = path.empty() ? db.Save() : db.SaveAs(path);
   if (!s) {
@@ -84,9 +92,10 @@ bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& r
 
 int ResolveField(const Database& db, const std::string& text) {
   if (auto n = ParseNumber(text); n && *n >= 0 && *n < format::kFieldCount) return static_cast<int>(*n);
-  std::string wanted = Utf8ToCp1252(text);
+  std::optional<std::string> wanted = StoredTextOrNothing(text);
+  if (!wanted) return -1;
   for (int slot = 0; slot < format::kFieldCount; ++slot) {
-    if (db.schema().field[slot].name.str() == wanted) return slot;
+    if (db.schema().field[slot].name.str() == *wanted) return slot;
   }
   return -1;
 }

@@ -27,6 +27,11 @@ bool OpenForCommand(Context& ctx, const std::string& path, Database& db);
 // that go on working in it (its view list and run-time state are kept).
 bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session);
 
+// For commands that only show what a file holds before its records: the
+// same access check, then the header, schema and popup lists alone, so
+// that the cost does not grow with the records.
+bool OpenHeadForCommand(Context& ctx, const std::string& path, DatabaseHead& head);
+
 // Saves `db` (to `path` when given); false after printing the message.
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");
 

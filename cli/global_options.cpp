@@ -5,6 +5,7 @@
 #include <ostream>
 #include <sstream>
 
+#include "cli/args.h"
 #include "cli/command.h"
 #include "platform/locale_info.h"
 #include "platform/qt/qt_platform.h"
@@ -113,7 +114,12 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
       locale.decimalSeparator = value[0];
     } else if (name == "--password") {
       if (!need(password)) return kExitUsage;
-      password = Utf8ToCp1252(password);
+      std::string stored, error;
+      if (!ToStoredText(password, "--password", stored, error)) {
+        err << "cardovex-cli: " << error << "\n";
+        return kExitUsage;
+      }
+      password = std::move(stored);
       passwordGiven = true;
     } else if (a == "--json") {
       json = true;

@@ -44,6 +44,24 @@ class DataRecord {
   std::shared_ptr<const Bytes> owned_;
 };
 
+// What a database file holds before its data records. Commands that show
+// only the header, the schema or the popup lists need no more than this,
+// and reading it costs the same whatever the number of records.
+struct DatabaseHead {
+  Header header;
+  Schema schema = InitSchema();
+  PopupLists popups{};
+  uint8_t schemaAttributes = 0;
+  uint32_t schemaUniqueID = 0;
+  // How many data records the file's entry list announces (none are read).
+  size_t dataRecords = 0;
+};
+
+// Reads the head of a database file by the same rules as Database::Open,
+// but only the bytes before record 31. Nothing is shown: on failure the
+// status holds the message the open would show.
+Status ReadDatabaseHead(const std::string& path, DatabaseHead& head);
+
 class Database {
  public:
   Database();
@@ -57,6 +75,9 @@ class Database {
   // succeeds with the records before it; partial() then tells, and Save()
   // will not overwrite the original file.
   Status Open(const std::string& path, UiPort& ui);
+  // The same open of a file's bytes already in memory (a database that
+  // arrived from outside and is not stored yet), named `path`.
+  Status OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui);
 
   // Writes the database to its path (or to `path`), never damaging the file
   // being replaced. On success the changed mark is cleared; on failure it
@@ -118,6 +139,8 @@ class Database {
   std::string Name() const { return header_.Name(); }
 
  private:
+  Status Load(const std::string& path, RecordSource source, UiPort& ui);
+
   std::string path_;
   Header header_;
   Schema schema_;
@@ -125,7 +148,7 @@ class Database {
   uint8_t schemaAttributes_ = 0;
   uint32_t schemaUniqueID_ = 0;
   std::vector<DataRecord> records_;
-  FileImage image_;  // keeps the views of unchanged records alive
+  std::shared_ptr<const void> image_;  // keeps the views of unchanged records alive
   // The file as read or last written; nothing for a database not yet on disk.
   std::optional<FileState> diskState_;
   uint32_t nextUnique_ = 0;  // 0: not yet computed

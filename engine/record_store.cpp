@@ -162,7 +162,11 @@ Status Database::Open(const std::string& path, UiPort& ui) {
     return Status::Error(message);
   }
   const ByteView bytes(image->data(), image->size());
-  return Load(path, RecordSource{std::move(image), bytes}, ui);
+  const auto state = image->state();
+  Status status = Load(path, RecordSource{std::move(image), bytes}, ui);
+  // Remembered so that a save can tell whether someone else changed the file.
+  if (status) diskState_ = state;
+  return status;
 }
 
 Status Database::OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui) {
@@ -220,7 +224,6 @@ Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) 
                        "values are shown cut short and are kept as they are unless edited.",
                    "Error", MessageIcon::Warning);
   }
-  db.diskState_ = image->state();
   db.image_ = std::move(image);
   *this = std::move(db);
   return Status::Ok();

@@ -5,7 +5,9 @@
 //
 // BM_SortAllPlain runs the same quicksort comparing through CompareRecords
 // (every comparison walks both records' slots) to show what reading the
-// keys out once per sort saves.
+// keys out once per sort saves. The Adversarial pair sorts values arranged
+// to defeat the median of three: the plain quicksort goes quadratic there,
+// SortAll (which falls back to heap sort) does not.
 #include <benchmark/benchmark.h>
 
 #include <array>
@@ -40,30 +42,30 @@ void ThreeKeys(Database& db) {
   keys[2] = {static_cast<uint8_t>(kPrice), 1};
 }
 
-void PlainSortAll(Database& db) {
-  std::vector<DataRecord>& t = db.table();
-  auto cmp = [&](const DataRecord& a, const DataRecord& b) { return CompareRecords(db, a.bytes(), b.bytes()); };
+// The median-of-three quicksort without any depth limit, over positions.
+template <typename Compare, typename Swap>
+void PlainQuickSort(long count, Compare cmp, Swap swap) {
   std::array<std::pair<long, long>, 64> stack;
   size_t depth = 0;
-  long lo = 0, hi = static_cast<long>(t.size()) - 1;
+  long lo = 0, hi = count - 1;
   for (;;) {
     while (hi > lo) {
       const long mid = (lo + hi) / 2;
-      if (cmp(t[lo], t[mid]) > 0) std::swap(t[lo], t[mid]);
-      if (cmp(t[lo], t[hi]) > 0) std::swap(t[lo], t[hi]);
-      if (cmp(t[mid], t[hi]) > 0) std::swap(t[mid], t[hi]);
+      if (cmp(lo, mid) > 0) swap(lo, mid);
+      if (cmp(lo, hi) > 0) swap(lo, hi);
+      if (cmp(mid, hi) > 0) swap(mid, hi);
       if (hi - lo < 3) break;
-      std::swap(t[mid], t[hi - 1]);
+      swap(mid, hi - 1);
       long i = lo, j = hi - 1;
       for (;;) {
-        while (++i < hi - 1 && cmp(t[i], t[hi - 1]) < 0) {
+        while (++i < hi - 1 && cmp(i, hi - 1) < 0) {
         }
-        while (--j > lo && cmp(t[j], t[hi - 1]) > 0) {
+        while (--j > lo && cmp(j, hi - 1) > 0) {
         }
         if (j < i) break;
-        std::swap(t[i], t[j]);
+        swap(i, j);
       }
-      std::swap(t[i], t[hi - 1]);
+      swap(i, hi - 1);
       if (j - lo <= hi - i) {
         stack[depth++] = {i + 1, hi};
         hi = j;
@@ -76,6 +78,73 @@ void PlainSortAll(Database& db) {
     std::tie(lo, hi) = stack[--depth];
   }
 }
+
+void PlainSortAll(Database& db) {
+  std::vector<DataRecord>& t = db.table();
+  PlainQuickSort(
+      static_cast<long>(t.size()),
+      [&](long x, long y) { return CompareRecords(db, t[x].bytes(), t[y].bytes()); },
+      [&](long x, long y) { std::swap(t[x], t[y]); });
+}
+
+// Values arranged so that the plain quicksort above takes n² comparisons:
+// an adversary fixes each value only when a comparison forces it, always
+// making the pivot as bad as it can be.
+std::vector<long> AdversarialValues(long n) {
+  std::vector<long> value(static_cast<size_t>(n), n), item(static_cast<size_t>(n));
+  for (long i = 0; i < n; ++i) item[static_cast<size_t>(i)] = i;
+  long solid = 0, candidate = -1;
+  PlainQuickSort(
+      n,
+      [&](long x, long y) {
+        const long a = item[static_cast<size_t>(x)], b = item[static_cast<size_t>(y)];
+        long& va = value[static_cast<size_t>(a)];
+        long& vb = value[static_cast<size_t>(b)];
+        if (va == n && vb == n) (a == candidate ? va : vb) = solid++;
+        if (va == n) {
+          candidate = a;
+        } else if (vb == n) {
+          candidate = b;
+        }
+        return va < vb ? -1 : (va > vb ? 1 : 0);
+      },
+      [&](long x, long y) { std::swap(item[static_cast<size_t>(x)], item[static_cast<size_t>(y)]); });
+  return value;
+}
+
+// One Integer field holding the adversarial arrangement, sorted on it.
+Database AdversarialDatabase(long n) {
+  Database db = Database::CreateNew("/nonexistent/bench-adversary.PDB", "Adversary");
+  Schema& s = db.schema();
+  s.field[0].typeNumber = static_cast<int16_t>(FieldType::Integer);
+  s.field[0].name.set("Value");
+  s.sortKey[0] = {0, 1};
+  Bytes editing = NewEditingRecord(s);
+  for (long v : AdversarialValues(n)) {
+    SetEditingNumber(editing, 0, static_cast<uint32_t>(v), s);
+    db.AppendRecord(Compact(editing, s));
+  }
+  return db;
+}
+
+template <typename Sort>
+void RunAdversarialSort(benchmark::State& state, Sort sort) {
+  Database db = AdversarialDatabase(state.range(0));
+  const std::vector<DataRecord> unsorted = db.table();
+  for (auto _ : state) {
+    state.PauseTiming();
+    db.table() = unsorted;
+    state.ResumeTiming();
+    sort(db);
+  }
+  state.SetItemsProcessed(state.iterations() * state.range(0));
+}
+
+void BM_SortAllAdversarial(benchmark::State& state) {
+  RunAdversarialSort(state, [](Database& db) { SortAll(db); });
+}
+
+void BM_SortAllPlainAdversarial(benchmark::State& state) { RunAdversarialSort(state, PlainSortAll); }
 
 template <typename Sort>
 void RunSort(benchmark::State& state, Sort sort) {
@@ -148,6 +217,8 @@ void BM_RecalculateAll(benchmark::State& state) {
 
 BENCHMARK(BM_SortAll)->Arg(4096)->Arg(16384)->Arg(65504)->Unit(benchmark::kMillisecond)->Complexity(benchmark::oNLogN);
 BENCHMARK(BM_SortAllPlain)->Arg(4096)->Arg(65504)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_SortAllAdversarial)->Arg(4096)->Arg(65504)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_SortAllPlainAdversarial)->Arg(4096)->Arg(16384)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_RebuildView)->Arg(4096)->Arg(16384)->Arg(65504)->Unit(benchmark::kMillisecond)->Complexity(benchmark::oN);
 BENCHMARK(BM_FindAllFields)->Arg(4096)->Arg(16384)->Arg(65504)->Unit(benchmark::kMillisecond)->Complexity(benchmark::oN);
 BENCHMARK(BM_RecalculateAll)->Arg(4096)->Arg(16384)->Arg(65504)->Unit(benchmark::kMillisecond)->Complexity(benchmark::oN);

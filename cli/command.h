@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "cli/cli_ui.h"
+#include "platform/file_io.h"
 #include "platform/locale_info.h"
 
 namespace cx::cli {
@@ -26,6 +27,9 @@ struct Context {
   std::ostream& out;
   std::ostream& err;
   CliUi& ui;
+  // Locks on the databases the command works on, held until it ends, so
+  // that commands run side by side take turns instead of losing updates.
+  std::vector<std::unique_ptr<FileLock>> locks = {};
 };
 
 class Command {

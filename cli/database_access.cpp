@@ -1,6 +1,8 @@
 #include "cli/database_access.h"
 
+#include <algorithm>
 #include <ostream>
+#include <tuple>
 
 #include "cli/args.h"
 #include "design/security.h"
@@ -8,6 +10,44 @@
 #include "platform/text_codec.h"
 
 namespace cx::cli {
+namespace {
+
+// Long enough for any other command on a database of the largest size to
+// finish; a command that is still waiting then is stuck behind something
+// else, and the user hears about it.
+constexpr int kLockWaitMs = 60000;
+
+bool SameFileAs(const FileState& a, const FileState& b) {
+  return a.device == b.device && a.inode == b.inode;
+}
+
+}  // namespace
+
+bool LockDatabases(Context& ctx, const std::vector<std::string>& paths) {
+  std::vector<std::pair<FileState, std::string>> wanted;
+  for (const std::string& path : paths) {
+    std::optional<FileState> state = StatFile(path);
+    if (!state) continue;
+    bool known = false;
+    for (const auto& held : ctx.locks) known = known || SameFileAs(held->state(), *state);
+    for (const auto& w : wanted) known = known || SameFileAs(w.first, *state);
+    if (!known) wanted.emplace_back(*state, path);
+  }
+  // One order for everyone, so that two commands that both lock the same
+  // two files never each hold one while waiting for the other.
+  std::sort(wanted.begin(), wanted.end(), [](const auto& a, const auto& b) {
+    return std::tie(a.first.device, a.first.inode) < std::tie(b.first.device, b.first.inode);
+  });
+  for (const auto& w : wanted) {
+    auto lock = std::make_unique<FileLock>();
+    if (Status s = lock->Acquire(w.second, kLockWaitMs); !s) {
+      Failure(ctx, s.message());
+      return false;
+    }
+    if (lock->held()) ctx.locks.push_back(std::move(lock));
+  }
+  return true;
+}
 
 bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
   DataSession session(db, ctx.locale, ctx.ui);
@@ -15,8 +55,17 @@ bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
 }
 
 bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session) {
+  if (!LockDatabases(ctx, {path})) return false;
   if (!CheckOpenAccess(path, ctx.ui)) return false;
   return OpenDatabase(session, path).ok();
+}
+
+bool OpenHeadForCommand(Context& ctx, const std::string& path, DatabaseHead& head) {
+  if (Status read = ReadDatabaseHead(path, head); !read) {
+    ctx.ui.ShowMessage(read.message(), "Error", MessageIcon::Error);
+    return false;
+  }
+  return CheckOpenAccess(head.schema, ctx.ui);
 }
 
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path) {
@@ -43,9 +92,10 @@ bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& r
 
 int ResolveField(const Database& db, const std::string& text) {
   if (auto n = ParseNumber(text); n && *n >= 0 && *n < format::kFieldCount) return static_cast<int>(*n);
-  std::string wanted = Utf8ToCp1252(text);
+  std::optional<std::string> wanted = StoredTextOrNothing(text);
+  if (!wanted) return -1;
   for (int slot = 0; slot < format::kFieldCount; ++slot) {
-    if (db.schema().field[slot].name.str() == wanted) return slot;
+    if (db.schema().field[slot].name.str() == *wanted) return slot;
   }
   return -1;
 }

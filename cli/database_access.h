@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "cli/args.h"
 #include "cli/command.h"
@@ -12,7 +13,12 @@
 
 namespace cx::cli {
 
-// Opens `path` into `db` as the program does: the "Open Database" access
+// Locks the databases at `paths` for the rest of the command, waiting a
+// while for another command that holds one. False after printing the
+// message when one stays busy. Files that do not exist are not locked.
+bool LockDatabases(Context& ctx, const std::vector<std::string>& paths);
+
+// Opens `path` into `db` as the program does (after locking it): the "Open Database" access
 // check (asking for --password where the file requires it), the open with
 // its messages, and the recalculation or re-sort the file still owes. On
 // failure the message has gone to stderr and the result is false.
@@ -20,6 +26,11 @@ bool OpenForCommand(Context& ctx, const std::string& path, Database& db);
 // The same into a session made with ctx's locale and port, for commands
 // that go on working in it (its view list and run-time state are kept).
 bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session);
+
+// For commands that only show what a file holds before its records: the
+// same access check, then the header, schema and popup lists alone, so
+// that the cost does not grow with the records.
+bool OpenHeadForCommand(Context& ctx, const std::string& path, DatabaseHead& head);
 
 // Saves `db` (to `path` when given); false after printing the message.
 bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");

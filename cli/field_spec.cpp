@@ -75,7 +75,8 @@ int FormatIndex(std::string f) {
 }  // namespace
 
 bool ParseFieldSpec(const std::string& text, FieldSpec& plan, std::string& error) {
-  std::string cp = Utf8ToCp1252(text);
+  std::string cp;
+  if (!ToStoredText(text, "the field " + text, cp, error)) return false;
   size_t c1 = cp.find(':');
   if (c1 == std::string::npos || c1 == 0) {
     error = "a field is NAME:TYPE[:options]";

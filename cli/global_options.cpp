@@ -1,8 +1,11 @@
 #include "cli/global_options.h"
 
+#include <cerrno>
+#include <cstring>
 #include <ostream>
 #include <sstream>
 
+#include "cli/args.h"
 #include "cli/command.h"
 #include "platform/locale_info.h"
 #include "platform/qt/qt_platform.h"
@@ -111,7 +114,12 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
       locale.decimalSeparator = value[0];
     } else if (name == "--password") {
       if (!need(password)) return kExitUsage;
-      password = Utf8ToCp1252(password);
+      std::string stored, error;
+      if (!ToStoredText(password, "--password", stored, error)) {
+        err << "cardovex-cli: " << error << "\n";
+        return kExitUsage;
+      }
+      password = std::move(stored);
       passwordGiven = true;
     } else if (a == "--json") {
       json = true;
@@ -160,6 +168,20 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
   std::vector<std::string> commandArgs(rest.begin() + 1, rest.end());
   int code = command->Run(ctx, commandArgs);
   if (code == kExitOk && ui.unanswered()) code = kExitFailed;
+  // Output that never arrived (a full disk, a closed pipe) is a failure,
+  // however well the rest went.
+  out.flush();
+  if (!out) {
+    // The stream only remembers that a write failed; one more try at what
+    // is still buffered brings back the reason.
+    out.clear();
+    errno = 0;
+    out.flush();
+    const int error = errno;
+    err << "cardovex-cli: the output could not be written"
+        << (error ? std::string(": ") + std::strerror(error) : std::string()) << "\n";
+    code = kExitFailed;
+  }
   return code;
 }
 

@@ -100,14 +100,10 @@ int OpenLevel(const Schema& schema) {
 }
 
 int OpenLevel(const std::string& path, Schema* schema) {
-  Header header;
-  if (ReadHeader(path, header) != 1) return -2;
-  std::vector<uint8_t> bytes;
-  if (header.numRecords < 1 || !ReadRecordAt(path, 0, bytes)) return -2;
-  Schema read;
-  if (!ReadSchema(bytes, read)) return -2;
-  const int level = OpenLevel(read);
-  if (schema) *schema = read;
+  DatabaseHead head;
+  if (!ReadDatabaseHead(path, head)) return -2;
+  const int level = OpenLevel(head.schema);
+  if (schema) *schema = head.schema;
   return level;
 }
 
@@ -124,9 +120,14 @@ bool CheckOpenAccess(const Schema& schema, UiPort& ui) {
 }
 
 bool CheckOpenAccess(const std::string& path, UiPort& ui) {
-  Schema schema;
-  if (OpenLevel(path, &schema) == -2) return true;  // the open itself will say why
-  return CheckOpenAccess(schema, ui);
+  DatabaseHead head;
+  if (Status read = ReadDatabaseHead(path, head); !read) {
+    // Without the schema the level is unknown: nothing may be let through.
+    ui.SetBusy(false);
+    ui.ShowMessage(read.message(), "Error", MessageIcon::Error);
+    return false;
+  }
+  return CheckOpenAccess(head.schema, ui);
 }
 
 SecuritySettings LoadSecuritySettings(const Schema& schema) {

@@ -85,8 +85,8 @@ int OpenLevel(const std::string& path, Schema* schema = nullptr);
 // The check made before a database file is opened: -1 refuses with "Action
 // Not Allowed for this Database!" / "ACCESS DENIED"; 1 asks for the file's
 // stored password (a cancel abandons the open quietly); 0 allows. A file
-// whose schema cannot be read is allowed here, so that opening it reports
-// the reason.
+// whose schema cannot be read (by the open's own reader) is refused with
+// the message the open would show.
 bool CheckOpenAccess(const std::string& path, UiPort& ui);
 // The same rule on a schema already read (a linked database that is loaded).
 bool CheckOpenAccess(const Schema& schema, UiPort& ui);

@@ -1,42 +1,30 @@
 #include "engine/dates.h"
 
 namespace cx {
-namespace {
-
-bool LeapIndex(int yearIndex) { return yearIndex % 4 == 0; }
-
-}  // namespace
-
 CalendarDate DayNumberToDate(uint32_t days) {
-  // Year indexes count from 1900; the day number starts in year index 4.
-  int64_t q = days / 365;
-  int64_t r = days % 365;
-  int64_t y = q + 4;
-  int64_t d = r - (q + 3) / 4 + 1;
-  if (d < 0) {
-    y = q + 3;
-    d = r - (q + 3) / 4 + 1 + 365;
-    if ((q + 3) % 4 == 0) d += 1;
-  }
-  CalendarDate out;
-  if (d == 0) {
-    out.year = static_cast<int>(1900 + y - 1);
-    out.month = 12;
-    out.day = 31;
-    return out;
+  // Whole four-year cycles first (each starts with its leap year), so the
+  // arithmetic stays exact for every 32-bit day number.
+  constexpr uint32_t kCycle = 4 * 365 + 1;
+  uint32_t rest = days % kCycle;
+  int64_t year = 1904 + int64_t{4} * (days / kCycle);
+  bool leap = true;
+  while (rest >= (leap ? 366u : 365u)) {
+    rest -= leap ? 366u : 365u;
+    ++year;
+    leap = false;
   }
   static constexpr int kMonthDays[12] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-  const int february = d > 59 && LeapIndex(static_cast<int>(y)) ? 29 : 28;
   int month = 0;
-  while (month < 11) {
-    int length = month == 1 ? february : kMonthDays[month];
-    if (d - length <= 0) break;
-    d -= length;
+  for (;;) {
+    const uint32_t length = static_cast<uint32_t>(kMonthDays[month] + (month == 1 && leap ? 1 : 0));
+    if (rest < length || month == 11) break;
+    rest -= length;
     ++month;
   }
-  out.year = static_cast<int>(1900 + y);
+  CalendarDate out;
+  out.year = static_cast<int>(year);
   out.month = month + 1;
-  out.day = static_cast<int>(d);
+  out.day = static_cast<int>(rest) + 1;
   return out;
 }
 

@@ -46,6 +46,14 @@ bool ReceiveRecord(const std::string& fileName, const std::string& recordFile, O
 
 bool ReceiveRecordBytes(const std::string& fileName, Bytes record, OpenDatabases& dbs, UiPort& ui,
                         ReceiveHooks& hooks) {
+  std::vector<Bytes> one;
+  one.push_back(std::move(record));
+  return ReceiveRecordsBytes(fileName, std::move(one), dbs, ui, hooks) == 1;
+}
+
+size_t ReceiveRecordsBytes(const std::string& fileName, std::vector<Bytes> records,
+                           OpenDatabases& dbs, UiPort& ui, ReceiveHooks& hooks) {
+  if (records.empty()) return 0;
   const std::string name = FileNamePart(DatabasePath(dbs.dataFolder, fileName));
 
   std::string path;
@@ -56,7 +64,7 @@ bool ReceiveRecordBytes(const std::string& fileName, Bytes record, OpenDatabases
   }
   if (path.empty()) {
     ui.ShowMessage(FormatMessage(kNotFound, name), "Update", MessageIcon::Information);
-    return false;
+    return 0;
   }
 
   Database* open = nullptr;
@@ -64,33 +72,40 @@ bool ReceiveRecordBytes(const std::string& fileName, Bytes record, OpenDatabases
     if (db && db->path() == path) open = db;
   }
   if (open) {
-    if (!hooks.AllowAdd(*open, ui)) return false;
-    if (!open->CanAddRecord()) return false;
-    size_t position = hooks.InsertionPlace(*open, record);
-    open->InsertRecord(position, std::move(record));
-    if (open == dbs.active) {
-      hooks.AfterInsertActive(*open, position);
-    } else {
-      MarkPending(*open);
+    if (!hooks.AllowAdd(*open, ui)) return 0;
+    size_t inserted = 0;
+    for (Bytes& record : records) {
+      if (!open->CanAddRecord()) break;
+      size_t position = hooks.InsertionPlace(*open, record);
+      open->InsertRecord(position, std::move(record));
+      if (open == dbs.active) hooks.AfterInsertActive(*open, position);
+      ++inserted;
     }
-    return true;
+    if (inserted > 0 && open != dbs.active) MarkPending(*open);
+    return inserted;
   }
 
-  if (!hooks.AllowOpen(path, ui)) return false;
+  if (!hooks.AllowOpen(path, ui)) return 0;
   Database db;
   if (!db.Open(path, ui).ok() || db.partial()) {
     ui.ShowMessage(kCannotOpen, "ERROR", MessageIcon::Error);
-    return false;
+    return 0;
   }
-  if (!db.CanAddRecord()) return false;
-  db.InsertRecord(hooks.InsertionPlace(db, record), std::move(record));
+  if (!hooks.AllowAdd(db, ui)) return 0;
+  size_t inserted = 0;
+  for (Bytes& record : records) {
+    if (!db.CanAddRecord()) break;
+    db.InsertRecord(hooks.InsertionPlace(db, record), std::move(record));
+    ++inserted;
+  }
+  if (inserted == 0) return 0;
   MarkPending(db);
   Status saved = db.Save();
   if (!saved) {
     ui.ShowMessage(saved.message(), "ERROR", MessageIcon::Error);
-    return false;
+    return 0;
   }
-  return true;
+  return inserted;
 }
 
 }  // namespace cx

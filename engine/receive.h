@@ -18,20 +18,16 @@ struct OpenDatabases {
   std::string dataFolder;       // where received records' databases live
 };
 
-// What the layers above the engine contribute to a receive.
+// What the layers above the engine contribute to a receive. The two access
+// checks have no default: a receiver that let everything through would
+// write into databases their owner has closed to additions.
 class ReceiveHooks {
  public:
   virtual ~ReceiveHooks() = default;
-  // The "Add Records" access check on an open database.
-  virtual bool AllowAdd(Database& db, UiPort& ui) {
-    (void)db, (void)ui;
-    return true;
-  }
+  // The "Add Records" access check on a database (open, or just loaded).
+  virtual bool AllowAdd(Database& db, UiPort& ui) = 0;
   // The "Open Database" access check on a database file about to be loaded.
-  virtual bool AllowOpen(const std::string& path, UiPort& ui) {
-    (void)path, (void)ui;
-    return true;
-  }
+  virtual bool AllowOpen(const std::string& path, UiPort& ui) = 0;
   // Where a new record goes (its sorted place); the end by default.
   virtual size_t InsertionPlace(const Database& db, ByteView record) {
     (void)record;
@@ -53,5 +49,11 @@ bool ReceiveRecord(const std::string& fileName, const std::string& recordFile, O
 // The same for record bytes already in memory.
 bool ReceiveRecordBytes(const std::string& fileName, Bytes record, OpenDatabases& dbs, UiPort& ui,
                         ReceiveHooks& hooks);
+// Several records for one database: the access checks are made once, and a
+// database that is not open is loaded and saved once. Returns how many were
+// inserted (in order, until the database is full); 0 with the target
+// unchanged when a check refuses or the database cannot be opened or saved.
+size_t ReceiveRecordsBytes(const std::string& fileName, std::vector<Bytes> records,
+                           OpenDatabases& dbs, UiPort& ui, ReceiveHooks& hooks);
 
 }  // namespace cx

@@ -11,10 +11,17 @@ bool RecordReader::Open(const std::string& path, size_t count, size_t listOffset
 }
 
 bool RecordReader::Open(FileImage image, size_t count, size_t listOffset) {
-  image_ = std::move(image);
+  RecordSource source;
+  if (image) source.bytes = std::span<const uint8_t>(image->data(), image->size());
+  source.owner = std::move(image);
+  return Open(std::move(source), count, listOffset);
+}
+
+bool RecordReader::Open(RecordSource source, size_t count, size_t listOffset) {
+  source_ = std::move(source);
   entries_.clear();
   next_ = 0;
-  const FileBuffer& file = *image_;
+  const std::span<const uint8_t> file = source_.bytes;
   if (listOffset > file.size() || count > (file.size() - listOffset) / format::kEntrySize) {
     return false;
   }
@@ -28,7 +35,7 @@ bool RecordReader::Open(FileImage image, size_t count, size_t listOffset) {
 bool RecordReader::Next(std::span<const uint8_t>& bytes, uint8_t& attributes, uint32_t& uniqueID) {
   if (next_ >= entries_.size()) return false;
   const RecordEntry& e = entries_[next_];
-  const size_t fileSize = image_->size();
+  const size_t fileSize = source_.bytes.size();
   ++next_;
   if (e.offset > fileSize) return false;
   size_t size;
@@ -46,7 +53,7 @@ bool RecordReader::Next(std::span<const uint8_t>& bytes, uint8_t& attributes, ui
       lastCut_ = true;
     }
   }
-  bytes = std::span<const uint8_t>(image_->data() + e.offset, size);
+  bytes = source_.bytes.subspan(e.offset, size);
   attributes = e.attributes;
   uniqueID = e.uniqueID;
   return true;

@@ -15,6 +15,12 @@
 namespace cx {
 
 using FileImage = std::shared_ptr<const FileBuffer>;
+// The bytes the records are read from, and whatever keeps them alive: the
+// whole file, or only its first part when the data records are not wanted.
+struct RecordSource {
+  std::shared_ptr<const void> owner;
+  std::span<const uint8_t> bytes;
+};
 
 class RecordReader {
  public:
@@ -23,6 +29,8 @@ class RecordReader {
   // not fit in it.
   bool Open(const std::string& path, size_t count, size_t listOffset = format::kListOffset);
   bool Open(FileImage image, size_t count, size_t listOffset = format::kListOffset);
+  // Over the first part of a file only: records beyond it cannot be read.
+  bool Open(RecordSource source, size_t count, size_t listOffset = format::kListOffset);
 
   // NextRecord: the next record's bytes, attributes and unique id. A record
   // runs to the next entry's offset; the last one to the end of the file,
@@ -35,11 +43,11 @@ class RecordReader {
   // True when the last record was longer than 65535 bytes and was cut.
   bool lastRecordCut() const { return lastCut_; }
   size_t count() const { return entries_.size(); }
-  const FileImage& image() const { return image_; }
+  const std::shared_ptr<const void>& owner() const { return source_.owner; }
   const std::vector<RecordEntry>& entries() const { return entries_; }
 
  private:
-  FileImage image_;
+  RecordSource source_;
   std::vector<RecordEntry> entries_;
   size_t next_ = 0;
   bool lastCut_ = false;

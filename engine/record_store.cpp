@@ -54,7 +54,80 @@ bool SameFile(const std::string& a, const std::string& b) {
   return !ec && ca == cb;
 }
 
+// The part of reading shared by the full open and the head alone: the
+// creator check, the entry list, the schema and the popup lists. `reader`
+// is left before the first data record.
+Status ReadHead(RecordReader& reader, RecordSource source, DatabaseHead& head) {
+  if (source.bytes.size() < format::kHeaderSize) return Status::Error(messages::kBadHeader);
+  head.header = DecodeHeader(source.bytes.data());
+  if (head.header.creator != format::kCreator) return Status::Error(messages::kBadHeader);
+  if (!reader.Open(std::move(source), head.header.numRecords)) {
+    return Status::Error(messages::kCannotInit);
+  }
+  ByteView bytes;
+  uint8_t attributes = 0;
+  uint32_t uniqueID = 0;
+  if (!reader.Next(bytes, attributes, uniqueID) || !ReadSchema(bytes, head.schema)) {
+    return Status::Error(messages::kCannotReadSchema);
+  }
+  head.schemaAttributes = attributes;
+  head.schemaUniqueID = uniqueID;
+  for (int i = 0; i < format::kPopupRecords; ++i) {
+    if (reader.index() >= reader.count()) break;
+    if (reader.Next(bytes, attributes, uniqueID)) {
+      head.popups[i] = DecodePopupList(bytes, attributes, uniqueID);
+    } else {
+      // An unreadable list stays empty, but its entry is kept.
+      const RecordEntry& e = reader.entries()[reader.index() - 1];
+      head.popups[i].attributes = e.attributes;
+      head.popups[i].uniqueID = e.uniqueID;
+    }
+  }
+  const size_t count = head.header.numRecords;
+  head.dataRecords = count > format::kFirstDataRecord ? count - format::kFirstDataRecord : 0;
+  return Status::Ok();
+}
+
 }  // namespace
+
+Status ReadDatabaseHead(const std::string& path, DatabaseHead& head) {
+  const std::string cannotOpen = FormatMessage(messages::kCannotOpen, path);
+  Header header;
+  const int found = ReadHeader(path, header);
+  if (found == 0) return Status::Error(cannotOpen);
+  if (found < 0) return Status::Error(messages::kBadHeader);
+  const int64_t fileSize = FileSize(path);
+  if (fileSize < 0) return Status::Error(cannotOpen);
+  const uint64_t size = static_cast<uint64_t>(fileSize);
+  const size_t count = header.numRecords;
+  const uint64_t listEnd = format::kListOffset + uint64_t{count} * format::kEntrySize;
+
+  // Where the head ends: at record 31, or a record's largest size past the
+  // start of the last one when the file holds no data records.
+  uint64_t end = listEnd;
+  if (count > 0) {
+    const size_t last = std::min<size_t>(count, format::kFirstDataRecord + 1) - 1;
+    uint8_t entry[format::kEntrySize];
+    if (listEnd <= size &&
+        ReadFileRange(path, format::kListOffset + last * format::kEntrySize, sizeof entry, entry) ==
+            static_cast<int64_t>(sizeof entry)) {
+      const uint64_t at = DecodeEntry(entry).offset;
+      end = std::max(end, last == format::kFirstDataRecord ? at : at + format::kMaxRecordSize + 1);
+    }
+  }
+  end = std::min(end, size);
+  auto bytes = std::make_shared<Bytes>(static_cast<size_t>(end));
+  const int64_t got = bytes->empty() ? 0 : ReadFileRange(path, 0, bytes->size(), bytes->data());
+  if (got < 0) return Status::Error(cannotOpen);
+  bytes->resize(static_cast<size_t>(got));
+
+  RecordReader reader;
+  RecordSource source{bytes, ByteView(*bytes)};
+  DatabaseHead read;
+  Status status = ReadHead(reader, std::move(source), read);
+  if (status) head = std::move(read);
+  return status;
+}
 
 std::string FormatMessage(const char* pattern, const std::string& text) {
   std::string out = pattern;
@@ -81,46 +154,51 @@ Database Database::CreateNew(const std::string& path, const std::string& name) {
 }
 
 Status Database::Open(const std::string& path, UiPort& ui) {
+  auto image = std::make_shared<FileBuffer>();
+  if (!image->Read(path)) {
+    const std::string message = FormatMessage(messages::kCannotOpen, path);
+    ui.SetBusy(false);
+    ui.ShowMessage(message, "Error", MessageIcon::Error);
+    return Status::Error(message);
+  }
+  const ByteView bytes(image->data(), image->size());
+  const auto state = image->state();
+  Status status = Load(path, RecordSource{std::move(image), bytes}, ui);
+  // Remembered so that a save can tell whether someone else changed the file.
+  if (status) diskState_ = state;
+  return status;
+}
+
+Status Database::OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui) {
+  const ByteView view = bytes ? ByteView(*bytes) : ByteView();
+  return Load(path, RecordSource{std::move(bytes), view}, ui);
+}
+
+Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) {
   auto fail = [&ui](std::string message) {
     ui.SetBusy(false);
     ui.ShowMessage(message, "Error", MessageIcon::Error);
     return Status::Error(std::move(message));
   };
 
-  auto image = std::make_shared<FileBuffer>();
-  if (!image->Read(path)) return fail(FormatMessage(messages::kCannotOpen, path));
-  if (image->size() < format::kHeaderSize) return fail(messages::kBadHeader);
+  RecordReader reader;
+  DatabaseHead head;
+  std::shared_ptr<const void> image = source.owner;
+  if (Status status = ReadHead(reader, std::move(source), head); !status) {
+    return fail(status.message());
+  }
   Database db;
   db.path_ = path;
-  db.header_ = DecodeHeader(image->data());
-  if (db.header_.creator != format::kCreator) return fail(messages::kBadHeader);
-
-  RecordReader reader;
-  if (!reader.Open(image, db.header_.numRecords)) return fail(messages::kCannotInit);
+  db.header_ = head.header;
+  db.schema_ = std::move(head.schema);
+  db.popups_ = std::move(head.popups);
+  db.schemaAttributes_ = head.schemaAttributes;
+  db.schemaUniqueID_ = head.schemaUniqueID;
 
   ByteView bytes;
   uint8_t attributes = 0;
   uint32_t uniqueID = 0;
-  if (!reader.Next(bytes, attributes, uniqueID) || !ReadSchema(bytes, db.schema_)) {
-    return fail(messages::kCannotReadSchema);
-  }
-  db.schemaAttributes_ = attributes;
-  db.schemaUniqueID_ = uniqueID;
-
-  for (int i = 0; i < format::kPopupRecords; ++i) {
-    if (reader.index() >= reader.count()) break;
-    if (reader.Next(bytes, attributes, uniqueID)) {
-      db.popups_[i] = DecodePopupList(bytes, attributes, uniqueID);
-    } else {
-      // An unreadable list stays empty, but its entry is kept.
-      const RecordEntry& e = reader.entries()[reader.index() - 1];
-      db.popups_[i].attributes = e.attributes;
-      db.popups_[i].uniqueID = e.uniqueID;
-    }
-  }
-
-  const size_t dataCount =
-      db.header_.numRecords > format::kFirstDataRecord ? db.header_.numRecords - format::kFirstDataRecord : 0;
+  const size_t dataCount = head.dataRecords;
   db.records_.reserve(dataCount);
   for (size_t n = 0; n < dataCount; ++n) {
     if (!reader.Next(bytes, attributes, uniqueID)) {
@@ -158,6 +236,10 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
     return Status::Error(
         "ERROR: This database could only be read in part.\nSave it under another name so that "
         "the original file is kept.");
+  }
+  if (diskState_ && SameFile(target, path_)) {
+    std::optional<FileState> now = StatFile(target);
+    if (now && *now != *diskState_) return Status::Error(FormatMessage(messages::kChangedOnDisk, target));
   }
   const size_t numRecords = format::kFirstDataRecord + records_.size();
   if (numRecords > format::kMaxFileRecords) return Status::Error("ERROR: Too many records to save");
@@ -212,9 +294,20 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
 
   header_ = header;
   path_ = target;
+  diskState_ = out.written();
   partial_ = false;
   changed_ = false;
   return Status::Ok();
+}
+
+bool Database::ChangedOnDisk() const {
+  if (!diskState_) return false;
+  std::optional<FileState> now = StatFile(path_);
+  return now && *now != *diskState_;
+}
+
+void Database::AcceptDiskState() {
+  if (std::optional<FileState> now = StatFile(path_)) diskState_ = now;
 }
 
 bool Database::InsertRecord(size_t position, Bytes stored, uint8_t attributes, uint32_t uniqueID) {

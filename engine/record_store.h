@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -13,6 +14,7 @@
 #include "engine/record_reader.h"
 #include "engine/schema.h"
 #include "platform/clock.h"
+#include "platform/file_io.h"
 #include "platform/status.h"
 #include "platform/ui_port.h"
 
@@ -42,6 +44,24 @@ class DataRecord {
   std::shared_ptr<const Bytes> owned_;
 };
 
+// What a database file holds before its data records. Commands that show
+// only the header, the schema or the popup lists need no more than this,
+// and reading it costs the same whatever the number of records.
+struct DatabaseHead {
+  Header header;
+  Schema schema = InitSchema();
+  PopupLists popups{};
+  uint8_t schemaAttributes = 0;
+  uint32_t schemaUniqueID = 0;
+  // How many data records the file's entry list announces (none are read).
+  size_t dataRecords = 0;
+};
+
+// Reads the head of a database file by the same rules as Database::Open,
+// but only the bytes before record 31. Nothing is shown: on failure the
+// status holds the message the open would show.
+Status ReadDatabaseHead(const std::string& path, DatabaseHead& head);
+
 class Database {
  public:
   Database();
@@ -55,12 +75,26 @@ class Database {
   // succeeds with the records before it; partial() then tells, and Save()
   // will not overwrite the original file.
   Status Open(const std::string& path, UiPort& ui);
+  // The same open of a file's bytes already in memory (a database that
+  // arrived from outside and is not stored yet), named `path`.
+  Status OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui);
 
   // Writes the database to its path (or to `path`), never damaging the file
   // being replaced. On success the changed mark is cleared; on failure it
-  // stays, and the message is in the status.
+  // stays, and the message is in the status. The file this database was
+  // read from (or last saved to) is not replaced when it has changed on
+  // disk since then: another program's changes would be lost without a
+  // word. See ChangedOnDisk and AcceptDiskState.
   Status Save(const Clock& clock = DefaultClock());
   Status SaveAs(const std::string& path, const Clock& clock = DefaultClock());
+
+  // True when the file at path() is no longer the one this database was
+  // read from or last saved to (another program replaced or rewrote it).
+  bool ChangedOnDisk() const;
+  // Takes the file as it is now on disk as the one this database came
+  // from, so that the next save replaces it: for a caller whose user
+  // chose to keep this version over the other program's.
+  void AcceptDiskState();
 
   const std::string& path() const { return path_; }
   void SetPath(const std::string& path) { path_ = path; }
@@ -105,6 +139,8 @@ class Database {
   std::string Name() const { return header_.Name(); }
 
  private:
+  Status Load(const std::string& path, RecordSource source, UiPort& ui);
+
   std::string path_;
   Header header_;
   Schema schema_;
@@ -112,7 +148,9 @@ class Database {
   uint8_t schemaAttributes_ = 0;
   uint32_t schemaUniqueID_ = 0;
   std::vector<DataRecord> records_;
-  FileImage image_;  // keeps the views of unchanged records alive
+  std::shared_ptr<const void> image_;  // keeps the views of unchanged records alive
+  // The file as read or last written; nothing for a database not yet on disk.
+  std::optional<FileState> diskState_;
   uint32_t nextUnique_ = 0;  // 0: not yet computed
   bool changed_ = false;
   bool partial_ = false;
@@ -127,6 +165,9 @@ inline constexpr const char* kBadHeader =
 inline constexpr const char* kCannotInit = "Could not initialize file";
 inline constexpr const char* kCannotReadSchema = "Could not read file";
 inline constexpr const char* kCannotReadRecord = "ERROR:Reading Record: %d";
+inline constexpr const char* kChangedOnDisk =
+    "%s was changed by another program after it was opened here, so it was not replaced. "
+    "Open it again to see those changes.";
 }  // namespace messages
 
 // printf-style "%s"/"%d" substitution for the messages above.

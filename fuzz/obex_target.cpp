@@ -177,7 +177,11 @@ int FuzzObexReceiver(const uint8_t* data, size_t size) {
     dbs.open.push_back(&open);
     dbs.active = &open;
   }
-  ReceiveHooks hooks;
+  // Every access granted, so that the insertion paths are reached.
+  struct GrantingHooks : ReceiveHooks {
+    bool AllowAdd(Database&, UiPort&) override { return true; }
+    bool AllowOpen(const std::string&, UiPort&) override { return true; }
+  } hooks;
   obex::ReceiveStore store(dbs, ui, hooks);
 
   ScriptedConnection connection(data + 1, size - 1, piece);

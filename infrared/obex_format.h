@@ -41,6 +41,7 @@ constexpr uint8_t kBadRequest = 0xC0;
 constexpr uint8_t kForbidden = 0xC3;
 constexpr uint8_t kNotFound = 0xC4;
 constexpr uint8_t kRequestTimeout = 0xC8;
+constexpr uint8_t kConflict = 0xC9;
 constexpr uint8_t kLengthRequired = 0xCB;
 constexpr uint8_t kEntityTooLarge = 0xCD;
 constexpr uint8_t kUnsupportedType = 0xCF;

@@ -38,6 +38,11 @@ struct ServerOptions {
   int packetTimeoutMs = 30000;
   // Bodies beyond this are refused (Request Entity Too Large).
   size_t maxObjectSize = size_t{32} << 20;
+  // The longest a response may take to go out: a peer that stops reading
+  // must not hold the session (and its thread) for ever.
+  int sendTimeoutMs = 10000;
+  // The longest a whole session may last, however busy the peer keeps it.
+  int sessionTimeoutMs = 10 * 60 * 1000;
   // When set, the session ends at once (between packets or while waiting).
   const std::atomic<bool>* stop = nullptr;
 };
@@ -45,7 +50,7 @@ struct ServerOptions {
 enum class SessionEnd {
   kDisconnected,  // the peer said goodbye
   kPeerClosed,    // the stream ended without DISCONNECT
-  kFailed,        // a receive failed or a packet took too long
+  kFailed,        // a receive or a send failed, or a packet or the session took too long
   kMalformed,     // a packet length made the stream unreadable
   kStopped,       // the stop flag was set
 };

@@ -20,6 +20,8 @@ constexpr char kAskRecords[] = "Insert %d received records into %s?";
 constexpr char kNotDatabase[] = "The received file %s is not a Cardovex database.";
 constexpr char kCloseFirst[] = "Close %s before receiving a new copy of it.";
 constexpr char kCannotStore[] = "Unable to store the received database %s.";
+constexpr char kAppeared[] =
+    "A database named %s was stored while you were asked; the received one was not stored.";
 constexpr char kQuestion[] = "QUESTION";
 
 // Names go into messages as the engine's texts are: Windows-1252.
@@ -27,8 +29,16 @@ std::string Shown(const char* pattern, const std::string& utf8Name) {
   return FormatMessage(pattern, Utf8ToCp1252(utf8Name));
 }
 
-bool IsOurDatabase(const Bytes& body) {
-  return body.size() >= format::kHeaderSize && DecodeHeader(body.data()).creator == format::kCreator;
+// The bytes must open as the program opens a file, whole: a creator code
+// alone says nothing about the rest, and what is stored here may replace a
+// good database.
+bool OpensWhole(const std::string& path, const Bytes& body) {
+  if (body.size() < format::kHeaderSize || DecodeHeader(body.data()).creator != format::kCreator) {
+    return false;
+  }
+  SilentUi quiet;
+  Database db;
+  return db.OpenBytes(path, std::make_shared<const Bytes>(body), quiet).ok() && !db.partial();
 }
 
 }  // namespace
@@ -75,11 +85,11 @@ uint8_t ReceiveStore::StoreDatabase(const ReceivedObject& object) {
   std::string name = SafeFileName(object.name);
   if (name.empty()) return Outcome(kBadRequest, "Refused a database with an unusable name");
   if (!HasExtension(name, ".PDB")) name += ".PDB";
-  if (!IsOurDatabase(object.body)) {
-    ui_.ShowMessage(Shown(kNotDatabase, name), "Error", MessageIcon::Error);
-    return Outcome(kUnsupportedType, "Refused " + name + ": not a Cardovex database");
-  }
   const std::string path = DatabasePath(dbs_.dataFolder, name);
+  if (!OpensWhole(path, object.body)) {
+    ui_.ShowMessage(Shown(kNotDatabase, name), "Error", MessageIcon::Error);
+    return Outcome(kUnsupportedType, "Refused " + name + ": not a readable Cardovex database");
+  }
   for (const Database* db : dbs_.open) {
     if (db && db->path() == path) {
       ui_.ShowMessage(Shown(kCloseFirst, name), "Error", MessageIcon::Error);
@@ -89,6 +99,11 @@ uint8_t ReceiveStore::StoreDatabase(const ReceivedObject& object) {
   bool exists = FileExists(path);
   if (!ui_.AskYesNo(Shown(exists ? kAskReplace : kAskDatabase, name), kQuestion)) {
     return Outcome(kForbidden, "Declined " + name);
+  }
+  // A file that appeared while the question was open was never asked about.
+  if (!exists && FileExists(path)) {
+    ui_.ShowMessage(Shown(kAppeared, name), "Error", MessageIcon::Error);
+    return Outcome(kConflict, "Refused " + name + ": a database of that name appeared meanwhile");
   }
   MakeDirectories(dbs_.dataFolder);
   SafeFileWriter writer(path);
@@ -130,14 +145,11 @@ uint8_t ReceiveStore::InsertRecords(const ReceivedObject& object, PayloadKind ki
                                                static_cast<long>(records.size()));
     if (!ui_.AskYesNo(question, kQuestion)) return Outcome(kForbidden, "Declined records for " + target);
   }
-  size_t inserted = 0;
-  for (Bytes& record : records) {
-    if (!ReceiveRecordBytes(target, std::move(record), dbs_, ui_, hooks_)) break;
-    ++inserted;
-  }
+  const size_t count = records.size();
+  const size_t inserted = ReceiveRecordsBytes(target, std::move(records), dbs_, ui_, hooks_);
   std::string line = "Inserted " + std::to_string(inserted) + " of " +
-                     std::to_string(records.size()) + " records into " + target;
-  return Outcome(inserted == records.size() ? kSuccess : kForbidden, line);
+                     std::to_string(count) + " records into " + target;
+  return Outcome(inserted == count ? kSuccess : kForbidden, line);
 }
 
 }  // namespace cx::obex

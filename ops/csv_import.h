@@ -3,7 +3,9 @@
 #pragma once
 
 #include <cstddef>
+#include <set>
 #include <string>
+#include <vector>
 
 #include "engine/record_store.h"
 #include "ops/csv_format.h"
@@ -33,10 +35,40 @@ constexpr int kCsvColumnsBySlot = 1;          // column n: field slot n
 bool ImportCsvRecord(Database& db, const CsvLine& line, int mode, const LocaleInfo& locale,
                      Bytes* scratch = nullptr);
 
+// Values the import rules above store other than the file gives them.
+enum class CsvIssue {
+  kNotConverted,  // not a number, date, time or check-box value of the field's type
+  kCut,           // longer than the field (or a Pop-Up entry) holds
+  kNoPopupRoom,   // a new Pop-Up text, but the list already holds 60 entries
+  kOpenQuote,     // a quote never closed: the rest of the file became one value
+};
+
+struct CsvValueIssue {
+  size_t line = 0;  // line of the file, from 1, where the record starts
+  int slot = -1;    // the field (-1 for an open quote)
+  CsvIssue issue = CsvIssue::kNotConverted;
+  std::string text;  // the value as read (cut for messages)
+  size_t room = 0;   // for kCut: the characters the field holds
+};
+
+struct CsvImportIssues {
+  // How many records of the file hold at least one such value.
+  size_t lines = 0;
+  // Every such value of the first kKeptLines of those records, in file order.
+  std::vector<CsvValueIssue> first;
+  static constexpr size_t kKeptLines = 5;
+
+  bool empty() const { return lines == 0; }
+  // One line per kept issue ("line 4, field "Done" (Check-Box): "yes"
+  // cannot be read"), Windows-1252 like the field names.
+  std::vector<std::string> Describe(const Schema& schema) const;
+};
+
 struct CsvImportResult {
   Status status;         // the first failure, if any
   size_t lines = 0;      // lines found in the file
   size_t imported = 0;   // records appended
+  CsvImportIssues issues;
 };
 
 // Imports every line of the file at `path`, appending the records in file
@@ -44,8 +76,11 @@ struct CsvImportResult {
 // largest number in its Unique and Link columns (so numbers given out to
 // records without one never collide with numbers still to come), then to
 // import. A file with more lines than the database has room for is
-// refused before anything is added.
+// refused before anything is added. The first reading also finds the
+// values the rules will not store as given (`issues`); with `strict` any of
+// them refuses the file, again before anything is added.
 CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
-                              const CsvSettings& settings, const LocaleInfo& locale);
+                              const CsvSettings& settings, const LocaleInfo& locale,
+                              bool strict = false);
 
 }  // namespace cx

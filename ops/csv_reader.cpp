@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <utility>
 
 namespace cx {
 namespace {
@@ -25,7 +26,17 @@ void TakePairedLineEnd(CsvStream& in, int first) {
 class FieldCollector {
  public:
   explicit FieldCollector(CsvLine* line) : line_(line) {
-    if (line_) line_->found = 0;
+    if (line_) {
+      line_->found = 0;
+      line_->openQuote = false;
+      line_->innerLineEnds = 0;
+    }
+  }
+  void OpenQuoteAtEnd() {
+    if (line_) line_->openQuote = true;
+  }
+  void InnerLineEnd() {
+    if (line_) ++line_->innerLineEnds;
   }
   void Add(char c) {
     if (line_) current_.push_back(c);
@@ -63,9 +74,15 @@ uint64_t WalkLine(CsvStream& in, char separator, CsvLine* line) {
   const uint64_t start = in.Tell();
   FieldCollector out(line);
   State state = State::Between;
+  int previous = kEnd, last = kEnd;
   for (;;) {
-    if (state != State::Between) out.Add(in.TakeOrdinary(sep, state == State::Quoted));
-    int c = in.Get();
+    if (state != State::Between) {
+      const std::string_view run = in.TakeOrdinary(sep, state == State::Quoted);
+      if (!run.empty()) last = static_cast<unsigned char>(run.back());
+      out.Add(run);
+    }
+    const int c = in.Get();
+    previous = std::exchange(last, c);
     if (state == State::Between) {
       if (c == kEnd) break;
       if (c == sep) {
@@ -101,6 +118,7 @@ uint64_t WalkLine(CsvStream& in, char separator, CsvLine* line) {
       }
     } else {  // Quoted
       if (c == kEnd) {
+        out.OpenQuoteAtEnd();
         out.Emit();
         break;
       }
@@ -115,6 +133,7 @@ uint64_t WalkLine(CsvStream& in, char separator, CsvLine* line) {
         }
       } else if (IsLineEnd(c)) {
         out.Add('\r');
+        if (c != 0 && !(c == '\n' && previous == '\r')) out.InnerLineEnd();
       } else {
         out.Add(static_cast<char>(c));
       }

@@ -65,6 +65,12 @@ class CsvStream {
 struct CsvLine {
   std::vector<std::string> fields;
   size_t found = 0;
+  // A quoted value was still open at the end of the file: it took in
+  // every line after its opening quote.
+  bool openQuote = false;
+  // Line ends read inside quoted values (a CR LF pair counting once), so
+  // that lines of the file can be told from lines of the table.
+  size_t innerLineEnds = 0;
 
   // The nth text; empty past the end.
   const std::string& Field(size_t n) const;

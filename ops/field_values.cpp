@@ -58,6 +58,8 @@ double ParseDouble(std::string_view text) {
   bool negative = false;
   if (i < text.size() && (text[i] == '+' || text[i] == '-')) negative = text[i++] == '-';
   std::string_view rest = text.substr(i);
+  // No number read means +0 whatever sign came before, as the C library
+  // gives; a "-0" would show as "-0.0000" after a Min or Max.
   if (rest.empty() || rest[0] == '+' || rest[0] == '-') return 0.0;
   double value = 0.0;
   const bool hex = rest.size() >= 2 && rest[0] == '0' && (rest[1] == 'x' || rest[1] == 'X');
@@ -65,6 +67,7 @@ double ParseDouble(std::string_view text) {
   const char* end = rest.data() + rest.size();
   auto result = std::from_chars(begin, end, value, hex ? std::chars_format::hex : std::chars_format::general);
   if (result.ec == std::errc::invalid_argument) {
+    if (!hex) return 0.0;
     value = 0.0;  // "0x" with nothing after it still reads its "0"
   } else if (result.ec == std::errc::result_out_of_range) {
     value = OutOfRange(std::string_view(begin, static_cast<size_t>(result.ptr - begin)), hex);

@@ -246,28 +246,44 @@ TransferResult TransferRecordsTo(bool move, const TransferWhich& which, DataSess
 
   ui.SetBusy(true);
   result.code = toSelf ? 1 : 0;
-  result.done = true;
   const size_t firstAdded = db.recordCount();
-  auto transferOne = [&](size_t index) {
-    // The copy is made before anything is removed, so a failed copy leaves
-    // the record where it was.
+  // Source indexes in the order their copies are added: highest first, so
+  // that removing them one by one later leaves the others' indexes valid.
+  std::vector<size_t> chosen;
+  if (which.allInView) {
+    const ViewTester tester(db, source.Link());
+    for (size_t i = db.recordCount(); i-- > 0;) {
+      if (tester.InView(i)) chosen.push_back(i);
+    }
+  } else {
+    chosen.push_back(which.index);
+  }
+  std::vector<size_t> copied;
+  for (size_t index : chosen) {
     Bytes copy(db.record(index).begin(), db.record(index).end());
-    if (!target->AppendRecord(std::move(copy))) return;
-    ++result.copied;
-    if (move && Allowed(services, db, LinkAccess::Delete)) {
+    if (target->AppendRecord(std::move(copy))) copied.push_back(index);
+  }
+  if (!toSelf && !copied.empty()) MarkAddedRecords(*target);
+
+  // A target loaded here is stored before a single record leaves the
+  // source: should the save fail, the records are still where they were.
+  if (loaded && loaded->changed()) {
+    Status s = loaded->Save(services.SaveClock());
+    if (!s) {
+      ui.SetBusy(false);
+      ui.ShowMessage(s.message(), "ERROR", MessageIcon::Error);
+      result.failed = true;
+      return result;
+    }
+  }
+  result.done = true;
+  result.copied = copied.size();
+  if (move) {
+    for (size_t index : copied) {
+      if (!Allowed(services, db, LinkAccess::Delete)) continue;
       db.DeleteRecord(index);
       ++result.deleted;
     }
-  };
-  if (which.allInView) {
-    const ViewTester tester(db, source.Link());
-    std::vector<size_t> inView;
-    for (size_t i = 0; i < db.recordCount(); ++i) {
-      if (tester.InView(i)) inView.push_back(i);
-    }
-    for (auto it = inView.rbegin(); it != inView.rend(); ++it) transferOne(*it);
-  } else {
-    transferOne(which.index);
   }
 
   if (toSelf && result.copied) {
@@ -277,8 +293,6 @@ TransferResult TransferRecordsTo(bool move, const TransferWhich& which, DataSess
     } else if (db.schema().sortKey[0].Field() >= 0) {
       SortAll(source, false);
     }
-  } else if (result.copied) {
-    MarkAddedRecords(*target);
   }
   if (result.deleted) {
     if (which.allInView) {
@@ -289,11 +303,6 @@ TransferResult TransferRecordsTo(bool move, const TransferWhich& which, DataSess
   }
   source.view = RebuildView(db, source.Link());
   ui.SetBusy(false);
-
-  if (loaded && loaded->changed()) {
-    Status s = loaded->Save(services.SaveClock());
-    if (!s) ui.ShowMessage(s.message(), "ERROR", MessageIcon::Error);
-  }
   return result;
 }
 

@@ -152,6 +152,7 @@ struct TransferWhich {
 struct TransferResult {
   int code = 0;          // 1: the target was the source itself (copy only); 0 otherwise
   bool done = false;     // false when refused or cancelled before any record moved
+  bool failed = false;   // the target could not be saved: the source lost nothing
   size_t copied = 0;
   size_t deleted = 0;    // records removed from the source (moving)
 };
@@ -170,8 +171,9 @@ TransferResult TransferRecords(bool move, const TransferWhich& which, DataSessio
 // "Delete Records" check before it is removed. Records added to another
 // database mark it for re-sorting and recalculation at its next opening;
 // added to the source itself they are placed and calculated at once. A
-// target loaded here is saved. After a move the source is recalculated and
-// its view rebuilt.
+// target loaded here is saved before any record is removed from the
+// source; when that save fails its message is shown and nothing is removed
+// (`failed`). After a move the source is recalculated and its view rebuilt.
 TransferResult TransferRecordsTo(bool move, const TransferWhich& which, DataSession& source,
                                  const std::string& targetPath, const LinkServices& services);
 

@@ -6,6 +6,7 @@
 
 #include "engine/value_text.h"
 #include "ops/value_parse.h"
+#include "ops/text_sink.h"
 #include "platform/file_io.h"
 
 namespace cx {
@@ -244,8 +245,11 @@ std::optional<std::string> RunReport(const Database& db, int fieldSlot, const Lo
 }
 
 Status ExportReportText(const std::string& report, const std::string& path) {
-  std::string bytes = report + "\n";
-  return WriteFileSafely(path, bytes.data(), bytes.size());
+  FileSink file(path);
+  if (Status s = file.Open(); !s) return s;
+  file.Write(report);
+  file.Write("\n");
+  return file.Commit();
 }
 
 }  // namespace cx

@@ -8,6 +8,7 @@
 #include "ops/calc.h"
 #include "ops/compare.h"
 #include "ops/field_values.h"
+#include "ops/position_sort.h"
 #include "ops/sort_keys.h"
 
 namespace cx {
@@ -17,53 +18,6 @@ constexpr const char* kCannotSortType = "This type of field (%s) cannot currentl
 constexpr const char* kCannotSortRelative =
     "Since this field (%s) references other records, it's value is relative to it's position, "
     "meaning that it cannot be the basis for a sort!";
-
-// The quicksort over positions 0 .. count - 1: median of three, the smaller
-// side first, an explicit stack of ranges. Working on the smaller side
-// first keeps the stack no deeper than log2(count), so 64 entries always
-// suffice. The two scans are also bounded by the range, which a consistent
-// comparison never needs (the pivot and record[lo] stop them) but a
-// comparison that is not a strict order (records missing the key's slot,
-// numbers more than 2^31 apart) could otherwise run past.
-template <typename Compare, typename Swap>
-void QuickSortPositions(long count, Compare compare, Swap swap) {
-  struct Range {
-    long lo, hi;
-  };
-  std::array<Range, 64> stack;
-  size_t depth = 0;
-  long lo = 0, hi = count - 1;
-  for (;;) {
-    while (hi > lo) {
-      const long mid = (lo + hi) / 2;
-      if (compare(lo, mid) > 0) swap(lo, mid);
-      if (compare(lo, hi) > 0) swap(lo, hi);
-      if (compare(mid, hi) > 0) swap(mid, hi);
-      if (hi - lo < 3) break;
-      const long pivot = hi - 1;
-      swap(mid, pivot);
-      long i = lo, j = pivot;
-      for (;;) {
-        do ++i; while (i < pivot && compare(i, pivot) < 0);
-        do --j; while (j > lo && compare(j, pivot) > 0);
-        if (j < i) break;
-        swap(i, j);
-      }
-      swap(i, pivot);
-      if (j - lo <= hi - i) {
-        stack[depth++] = {i + 1, hi};
-        hi = j;
-      } else {
-        stack[depth++] = {lo, j};
-        lo = i + 1;
-      }
-    }
-    if (depth == 0) break;
-    --depth;
-    lo = stack[depth].lo;
-    hi = stack[depth].hi;
-  }
-}
 
 bool AnyKeySet(const Schema& schema) {
   return std::any_of(schema.sortKey.begin(), schema.sortKey.end(),
@@ -103,7 +57,7 @@ void SortAll(Database& db) {
   if (db.schema().sortKey[0].Field() == -1 || count < 2) return;
   SortKeyTable keys(db);
   std::vector<SortKeyTable::Row>& rows = keys.rows();
-  QuickSortPositions(
+  SortPositions(
       static_cast<long>(count), [&](long x, long y) { return keys.Compare(rows[x], rows[y]); },
       [&](long x, long y) { std::swap(rows[x], rows[y]); });
   std::vector<DataRecord>& table = db.table();

@@ -6,6 +6,7 @@
 #include <cstdio>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "platform/file_io.h"
 #include "platform/status.h"
@@ -34,10 +35,12 @@ class StringSink : public TextSink {
 // Bytes into a new version of a file that replaces the old one only when
 // Commit() succeeds (nothing is left behind otherwise). Not flushed to disk:
 // an export can always be made again, and waiting for the disk would make
-// every export of a large database pay for it.
+// every export of a large database pay for it. A FIFO, a terminal or a
+// device given as the file is written into, not replaced.
 class FileSink : public TextSink {
  public:
-  explicit FileSink(const std::string& path) : writer_(path, /*sync=*/false) {}
+  explicit FileSink(const std::string& path)
+      : writer_(path, SafeFileWriter::Options{/*sync=*/false, /*writeIntoSpecialFiles=*/true}) {}
   Status Open() { return writer_.Open(); }
   bool Write(std::string_view bytes) override { return writer_.Write(bytes.data(), bytes.size()); }
   Status Commit() { return writer_.Commit(); }
@@ -45,6 +48,12 @@ class FileSink : public TextSink {
  private:
   SafeFileWriter writer_;
 };
+
+// Whether text may be written to `path`: not over a database file of this
+// program, nor over one of `inputs` (the files the text is made from). A
+// slip in the order of two arguments would otherwise turn a database into
+// a page of text. Callers that asked the user may write anyway.
+Status CheckTextTarget(const std::string& path, const std::vector<std::string>& inputs);
 
 // A stdio stream (stdout for the command-line tool). With `toUtf8` every
 // byte is widened from Windows-1252 to UTF-8 on the way out.

@@ -8,7 +8,9 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <cerrno>
+#include <chrono>
 #include <cstdlib>
 
 namespace cx {
@@ -43,10 +45,22 @@ class TcpConnection : public StreamConnection {
 
   long Send(const uint8_t* data, size_t size) override {
     if (fd_ < 0) return Fail(ENOTCONN);
+    using Clock = std::chrono::steady_clock;
+    const auto deadline = Clock::now() + std::chrono::milliseconds(sendTimeoutMs_ < 0 ? 0 : sendTimeoutMs_);
     size_t done = 0;
     while (done < size) {
-      ssize_t n = ::send(fd_, data + done, size - done, MSG_NOSIGNAL);
-      if (n < 0 && errno == EINTR) continue;
+      if (sendTimeoutMs_ >= 0) {
+        const auto left =
+            std::chrono::duration_cast<std::chrono::milliseconds>(deadline - Clock::now()).count();
+        const int ready = left > 0 ? WaitFor(fd_, POLLOUT, static_cast<int>(left)) : 0;
+        if (ready <= 0) {
+          error_ = ready == 0 ? ETIMEDOUT : errno;
+          return done > 0 ? static_cast<long>(done) : -1;
+        }
+      }
+      const int flags = MSG_NOSIGNAL | (sendTimeoutMs_ >= 0 ? MSG_DONTWAIT : 0);
+      ssize_t n = ::send(fd_, data + done, size - done, flags);
+      if (n < 0 && (errno == EINTR || errno == EAGAIN || errno == EWOULDBLOCK)) continue;
       if (n <= 0) {
         error_ = n < 0 ? errno : EPIPE;
         return done > 0 ? static_cast<long>(done) : -1;
@@ -54,6 +68,12 @@ class TcpConnection : public StreamConnection {
       done += static_cast<size_t>(n);
     }
     return static_cast<long>(done);
+  }
+
+  void SetSendTimeout(int timeoutMs) override { sendTimeoutMs_ = timeoutMs; }
+
+  void Interrupt() override {
+    if (fd_ >= 0) ::shutdown(fd_, SHUT_RDWR);
   }
 
   long Receive(uint8_t* data, size_t size, int timeoutMs) override {
@@ -85,9 +105,11 @@ class TcpConnection : public StreamConnection {
     return -1;
   }
 
-  int fd_;
+  // Read by Interrupt from another thread; it changes only in Close.
+  std::atomic<int> fd_;
   std::string peer_;
   int error_ = 0;
+  int sendTimeoutMs_ = -1;
 };
 
 class TcpListener : public StreamListener {
@@ -282,7 +304,7 @@ std::unique_ptr<StreamListener> TcpTransport::Listen(const std::string& address,
   int fd = ::socket(list->ai_family, list->ai_socktype | SOCK_CLOEXEC, list->ai_protocol);
   int one = 1;
   bool ok = fd >= 0 && ::setsockopt(fd, SOL_SOCKET, SO_REUSEADDR, &one, sizeof one) == 0 &&
-            ::bind(fd, list->ai_addr, list->ai_addrlen) == 0 && ::listen(fd, 4) == 0;
+            ::bind(fd, list->ai_addr, list->ai_addrlen) == 0 && ::listen(fd, 16) == 0;
   error = ok ? 0 : errno;
   ::freeaddrinfo(list);
   if (!ok) {

@@ -75,6 +75,10 @@ char32_t NextCodePoint(std::string_view s, size_t& i) {
     if (i >= s.size() || (static_cast<unsigned char>(s[i]) & 0xC0) != 0x80) return 0xFFFD;
     cp = (cp << 6) | (static_cast<unsigned char>(s[i++]) & 0x3F);
   }
+  // An over-long form would let "/" or a quote arrive disguised as
+  // something no check looks for; surrogates are no characters.
+  constexpr char32_t kShortest[4] = {0, 0x80, 0x800, 0x10000};
+  if (cp < kShortest[extra] || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return 0xFFFD;
   return cp;
 }
 

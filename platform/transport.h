@@ -28,6 +28,16 @@ class StreamConnection {
   // Shuts both directions down and releases the stream. Idempotent.
   virtual void Close() = 0;
 
+  // Bounds every later Send: one that cannot hand over all its bytes within
+  // `timeoutMs` (a peer that stopped reading) fails with ETIMEDOUT. A
+  // negative value waits without limit, as a new connection does.
+  virtual void SetSendTimeout(int timeoutMs) { (void)timeoutMs; }
+
+  // Wakes a Send or Receive blocked in another thread, which then fails;
+  // the stream stays allocated until Close. Safe to call from any thread
+  // while the connection exists.
+  virtual void Interrupt() {}
+
   virtual int error() const = 0;
   // Who is at the other end, for messages ("127.0.0.1:650").
   virtual std::string peer() const = 0;

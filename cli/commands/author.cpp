@@ -28,12 +28,23 @@ class AuthorCommand : public Command {
     Args args(argv, {"--author", "--comments"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
-    Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
-    AuthorInfo info = LoadAuthorInfo(db.schema());
-    if (args.has("--author") || args.has("--comments")) {
-      if (auto a = args.value("--author")) info.author = Utf8ToCp1252(*a);
-      if (auto c = args.value("--comments")) info.comments = Utf8ToCp1252(*c);
+    AuthorInfo info;
+    if (!args.has("--author") && !args.has("--comments")) {
+      DatabaseHead head;
+      if (!OpenHeadForCommand(ctx, args.positional()[0], head)) return kExitFailed;
+      info = LoadAuthorInfo(head.schema);
+    } else {
+      Database db;
+      if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+      info = LoadAuthorInfo(db.schema());
+      std::string error;
+      if (auto a = args.value("--author"); a && !ToStoredText(*a, "--author", info.author, error)) {
+        return UsageError(ctx, *this, error);
+      }
+      if (auto c = args.value("--comments");
+          c && !ToStoredText(*c, "--comments", info.comments, error)) {
+        return UsageError(ctx, *this, error);
+      }
       if (info.author.size() > 39) return UsageError(ctx, *this, "--author takes at most 39 characters");
       if (info.comments.size() > 69) return UsageError(ctx, *this, "--comments takes at most 69 characters");
       if (!PassAccessCheck(ctx, db, secured::kDBProperties)) return kExitFailed;

@@ -14,7 +14,7 @@ class ExportCsvCommand : public Command {
   std::string summary() const override { return "write the records as comma-separated text"; }
   std::string help() const override {
     return "Usage: cardovex-cli export-csv FILE OUT [--quote-all] [--header] [--filtered]\n"
-           "                                [--slot-order]\n"
+           "                                [--slot-order] [--force]\n"
            "Writes one line per record, each value as the list shows it (\"No Value\"\n"
            "where that is empty; Image columns stay empty), lines ending in LF, in\n"
            "Windows-1252. OUT '-' writes to standard output in UTF-8.\n"
@@ -22,14 +22,19 @@ class ExportCsvCommand : public Command {
            "  --header      a first line of field names\n"
            "  --filtered    only the records in view (those that pass the filters)\n"
            "  --slot-order  columns in field slot order instead of display order\n"
+           "  --force       write OUT even when it is a database or FILE itself\n"
+           "OUT is replaced only once the whole text is written; a FIFO or a device\n"
+           "named as OUT is written into.\n"
            "Columns are the used fields. When the first field of the order is\n"
            "Not-Used, every data line starts with a separator that the header lacks.\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--quote-all", "--header", "--filtered", "--slot-order"});
+    Args args(argv, {}, {"--quote-all", "--header", "--filtered", "--slot-order", "--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE OUT");
+    const std::string& out = args.positional()[1];
+    if (out != "-" && !TextTargetAllowed(ctx, args, out, args.positional()[0])) return kExitFailed;
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     CsvExportOptions options;
@@ -39,7 +44,6 @@ class ExportCsvCommand : public Command {
     options.fieldNumberOrder = args.has("--slot-order");
     CsvSettings settings;
     settings.alwaysQuote = options.quoteAll;
-    const std::string& out = args.positional()[1];
     int result;
     if (out == "-") {
       Utf8StreamSink sink(ctx.out);

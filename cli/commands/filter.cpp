@@ -106,7 +106,10 @@ class FilterCommand : public Command {
     for (size_t eq = cond.find('='); eq != std::string::npos; eq = cond.find('=', eq + 1)) {
       const int field = ResolveField(db, cond.substr(0, eq));
       if (field < 0) continue;
-      const std::string value = Utf8ToCp1252(cond.substr(eq + 1));
+      std::string value;
+      if (!ToStoredText(cond.substr(eq + 1), "the value of " + cond.substr(0, eq), value, error)) {
+        return false;
+      }
       if (ReadFilterValueText(db, field, value, ctx.locale, f, error)) return true;
       error = Cp1252ToUtf8(error);
       return false;

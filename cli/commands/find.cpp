@@ -48,7 +48,10 @@ class FindCommand : public Command {
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TEXT");
     SearchSettings search;
-    search.text = Utf8ToCp1252(args.positional()[1]);
+    std::string error;
+    if (!ToStoredText(args.positional()[1], "TEXT", search.text, error)) {
+      return UsageError(ctx, *this, error);
+    }
     if (search.text.empty()) return UsageError(ctx, *this, "TEXT is empty");
     if (search.text.size() > kSearchTextMax) {
       return UsageError(ctx, *this, "TEXT has more than " + std::to_string(kSearchTextMax) + " characters");

@@ -22,9 +22,9 @@ int Level(const Schema& s, int op) { return (s.securityLevels >> (2 * op)) & 3; 
 
 std::string U(const std::string& cp1252) { return Cp1252ToUtf8(cp1252); }
 
-void WriteJson(std::ostream& out, const Database& db) {
-  const Header& h = db.header();
-  const Schema& s = db.schema();
+void WriteJson(std::ostream& out, const DatabaseHead& db) {
+  const Header& h = db.header;
+  const Schema& s = db.schema;
   JsonWriter j(out);
   j.BeginObject();
   j.Key("name").String(U(h.Name()));
@@ -35,7 +35,7 @@ void WriteJson(std::ostream& out, const Database& db) {
   j.Key("creationDate").Number(h.creationDate);
   j.Key("modificationDate").Number(h.modificationDate);
   j.Key("numRecords").Number(h.numRecords);
-  j.Key("recordCount").Number(static_cast<int64_t>(db.recordCount()));
+  j.Key("recordCount").Number(static_cast<int64_t>(db.dataRecords));
   j.Key("schemaVersion").Number(s.schemaVersion);
   j.Key("recordExtension").Bool(s.recordExtension != 0);
   j.Key("fields").BeginArray();
@@ -65,7 +65,7 @@ void WriteJson(std::ostream& out, const Database& db) {
   }
   j.EndArray();
   j.Key("popups").BeginArray();
-  for (const PopupList& list : db.popups()) {
+  for (const PopupList& list : db.popups) {
     j.BeginArray();
     for (const std::string& item : list.items) j.String(U(item));
     j.EndArray();
@@ -83,12 +83,12 @@ void WriteJson(std::ostream& out, const Database& db) {
   j.Finish();
 }
 
-void WriteText(std::ostream& out, const Database& db) {
-  const Header& h = db.header();
-  const Schema& s = db.schema();
+void WriteText(std::ostream& out, const DatabaseHead& db) {
+  const Header& h = db.header;
+  const Schema& s = db.schema;
   out << "Name:        " << U(h.Name()) << "\n"
       << "Type:        " << FourCCText(h.type) << "   Creator: " << FourCCText(h.creator) << "\n"
-      << "Records:     " << db.recordCount() << "\n"
+      << "Records:     " << db.dataRecords << "\n"
       << "Schema:      version " << int(s.schemaVersion)
       << (s.recordExtension ? ", records carry the prefix extension" : "") << "\n";
   if (!s.author.empty()) out << "Author:      " << U(s.author.str()) << "\n";
@@ -99,7 +99,7 @@ void WriteText(std::ostream& out, const Database& db) {
     if (f.type() == FieldType::NotUsed) continue;
     out << "  " << (slot < 10 ? " " : "") << int(slot) << "  " << U(f.name.str()) << "  ("
         << FieldTypeLabel(f.type()) << ")";
-    if (!db.popups()[slot].items.empty()) out << "  " << db.popups()[slot].items.size() << " popup items";
+    if (!db.popups[slot].items.empty()) out << "  " << db.popups[slot].items.size() << " popup items";
     out << "\n";
   }
   out << "Sort keys:  ";
@@ -128,8 +128,8 @@ class InfoCommand : public Command {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
-    Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    DatabaseHead db;
+    if (!OpenHeadForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     if (ctx.json) {
       WriteJson(ctx.out, db);
     } else {

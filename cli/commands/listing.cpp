@@ -14,19 +14,25 @@ class ListingCommand : public Command {
   std::string name() const override { return "listing"; }
   std::string summary() const override { return "write records as a \"name: value\" text listing"; }
   std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] listing FILE [--record N] [-o OUT]\n"
+    return "Usage: cardovex-cli [--password PW] listing FILE [--record N]\n"
+           "                                          [-o OUT [--force]]\n"
            "Writes the records in view (or record N, its index in table order) as the\n"
            "Export Record(s) command does: per record one \"NAME: VALUE\" line for each\n"
            "used field marked Export/Print, in display order, then 40 dashes. A Link\n"
            "field lists its linked records in its place, indented by three blanks per\n"
            "level. Lines end in LF.\n"
-           "  -o OUT   write to OUT (Windows-1252) instead of standard output (UTF-8)\n";
+           "  -o OUT   write to OUT (Windows-1252) instead of standard output (UTF-8);\n"
+           "           a FIFO or device is written into\n"
+           "  --force  write OUT even when it is a database or FILE itself\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--record", "-o"}, {});
+    Args args(argv, {"--record", "-o"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+    if (auto out = args.value("-o"); out && !TextTargetAllowed(ctx, args, *out, args.positional()[0])) {
+      return kExitFailed;
+    }
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     std::optional<size_t> record;

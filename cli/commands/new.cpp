@@ -34,7 +34,10 @@ class NewCommand : public Command {
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     const std::string path = args.positional()[0];
-    std::string name = Utf8ToCp1252(args.value("--name").value_or(""));
+    std::string name, error;
+    if (!ToStoredText(args.value("--name").value_or(""), "--name", name, error)) {
+      return UsageError(ctx, *this, error);
+    }
     if (name.empty()) return UsageError(ctx, *this, "--name is required");
     if (name.size() > 19) return UsageError(ctx, *this, "a database name has at most 19 characters");
     if (args.values("--field").size() > format::kFieldCount) {

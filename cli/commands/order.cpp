@@ -38,14 +38,16 @@ class OrderCommand : public Command {
     const auto& p = args.positional();
     if (p.empty() || p.size() % 2 == 0) return UsageError(ctx, *this, "expected FILE [up|down FIELD ...]");
     if (p.size() > 1 && args.has("--set")) return UsageError(ctx, *this, "--set replaces the moves");
+    if (p.size() == 1 && !args.has("--set")) {
+      DatabaseHead head;
+      if (!OpenHeadForCommand(ctx, p[0], head)) return kExitFailed;
+      Show(ctx, FieldOrderEditor(head.schema));
+      return kExitOk;
+    }
     Database db;
     if (!OpenForCommand(ctx, p[0], db)) return kExitFailed;
 
     FieldOrderEditor editor(db.schema());
-    if (p.size() == 1 && !args.has("--set")) {
-      Show(ctx, db, editor);
-      return kExitOk;
-    }
     std::array<uint8_t, format::kFieldCount> order = editor.order();
     if (auto list = args.value("--set")) {
       std::stringstream in(*list);
@@ -85,12 +87,12 @@ class OrderCommand : public Command {
     db.schema().fieldOrder = order;
     db.MarkChanged();
     if (!SaveForCommand(ctx, db)) return kExitFailed;
-    Show(ctx, db, FieldOrderEditor(db.schema()));
+    Show(ctx, FieldOrderEditor(db.schema()));
     return kExitOk;
   }
 
  private:
-  static void Show(Context& ctx, const Database& db, const FieldOrderEditor& editor) {
+  static void Show(Context& ctx, const FieldOrderEditor& editor) {
     const auto names = editor.ListTexts();
     if (ctx.json) {
       JsonWriter j(ctx.out);
@@ -106,7 +108,6 @@ class OrderCommand : public Command {
       j.Finish();
       return;
     }
-    (void)db;
     for (int pos = 0; pos < format::kFieldCount; ++pos) {
       ctx.out << pos << "\t" << int(editor.order()[pos]) << "\t" << Cp1252ToUtf8(names[pos]) << "\n";
     }

@@ -70,12 +70,16 @@ class PopupsCommand : public Command {
     PopupEditor editor(session, slot);
     if (action == "add") {
       for (const std::string& v : rest) {
-        if (!editor.New(Utf8ToCp1252(v))) return kExitFailed;
+        std::string value, error;
+        if (!ToStoredText(v, "VALUE", value, error)) return UsageError(ctx, *this, error);
+        if (!editor.New(value)) return kExitFailed;
       }
     } else if (action == "rename") {
       const int entry = FindEntry(editor, rest[0]);
       if (entry < 0) return Failure(ctx, "No popup entry " + rest[0]);
-      if (!editor.Rename(editor.PositionOf(entry), Utf8ToCp1252(rest[1]))) return kExitFailed;
+      std::string value, error;
+      if (!ToStoredText(rest[1], "NEW-VALUE", value, error)) return UsageError(ctx, *this, error);
+      if (!editor.Rename(editor.PositionOf(entry), value)) return kExitFailed;
     } else if (action == "delete") {
       const int entry = FindEntry(editor, rest[0]);
       if (entry < 0) return Failure(ctx, "No popup entry " + rest[0]);
@@ -96,9 +100,10 @@ class PopupsCommand : public Command {
       auto n = ParseNumber(text.substr(1));
       return n && *n >= 0 && *n < static_cast<long>(entries.size()) ? static_cast<int>(*n) : -1;
     }
-    const std::string wanted = Utf8ToCp1252(text);
+    const std::optional<std::string> wanted = StoredTextOrNothing(text);
+    if (!wanted) return -1;
     for (size_t i = 0; i < entries.size(); ++i) {
-      if (entries[i] == wanted) return static_cast<int>(i);
+      if (entries[i] == *wanted) return static_cast<int>(i);
     }
     return -1;
   }

@@ -5,6 +5,7 @@
 
 #include "cli/args.h"
 #include "cli/command.h"
+#include "design/receive_access.h"
 #include "infrared/receiver.h"
 #include "platform/data_folder.h"
 #include "platform/qt/qt_platform.h"
@@ -18,20 +19,25 @@ std::atomic<bool>& StopFlag() {
   return stop;
 }
 
-extern "C" void OnInterrupt(int) { StopFlag() = true; }
+extern "C" void OnStopSignal(int) { StopFlag() = true; }
 
 class ReceiveCommand : public Command {
  public:
   std::string name() const override { return "receive"; }
   std::string summary() const override { return "receive beamed databases and records"; }
   std::string help() const override {
-    return "Usage: cardovex-cli [--yes] receive [--listen HOST:PORT] [--count N]\n"
+    return "Usage: cardovex-cli [--yes] [--password PW] receive [--listen HOST:PORT] [--count N]\n"
            "Listens for OBEX transfers over TCP (default: the ReceiveAddress setting, else\n"
            "0.0.0.0:650; ports below 1024 need root) and stores what arrives in the data\n"
            "folder: a database is stored after asking (an existing one is replaced only\n"
            "when that is answered Yes), records are inserted into the database of the\n"
            "same name, which must be present. --yes answers every question Yes; without\n"
            "it the questions are asked on the terminal, or answered No when there is none.\n"
+           "A received database is stored only when it opens whole. Records go through\n"
+           "the \"Open Database\" and \"Add Records\" checks of their database: where one\n"
+           "asks for the password, --password answers it; without it nothing is stored.\n"
+           "Several peers are served at once; one that stops sending or reading is\n"
+           "dropped after a time-out. Ctrl-C (SIGINT) or SIGTERM ends the command.\n"
            "  --count N   stop after N objects have arrived (default: run until Ctrl-C)\n"
            "Prints \"Listening on ADDR\" and one line per object.\n";
   }
@@ -50,13 +56,16 @@ class ReceiveCommand : public Command {
       options.count = static_cast<int>(*n);
     }
     StopFlag() = false;
-    auto previous = std::signal(SIGINT, OnInterrupt);
+    auto previousInt = std::signal(SIGINT, OnStopSignal);
+    auto previousTerm = std::signal(SIGTERM, OnStopSignal);
     std::string folder = DataFolder(DesktopDocumentsFolder());
+    AccessCheckedReceiveHooks hooks;
     Status s = obex::ReceiveIntoDataFolder(
-        folder, ctx.ui, options, StopFlag(),
+        folder, ctx.ui, hooks, options, StopFlag(),
         [&](const std::string& address) { ctx.out << "Listening on " << address << std::endl; },
         [&](const std::string& line) { ctx.out << line << std::endl; });
-    std::signal(SIGINT, previous);
+    std::signal(SIGINT, previousInt);
+    std::signal(SIGTERM, previousTerm);
     if (!s) return Failure(ctx, s.message());
     return kExitOk;
   }

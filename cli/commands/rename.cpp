@@ -25,7 +25,8 @@ class RenameCommand : public Command {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE NAME");
-    const std::string name = Utf8ToCp1252(args.positional()[1]);
+    std::string name, error;
+    if (!ToStoredText(args.positional()[1], "NAME", name, error)) return UsageError(ctx, *this, error);
     if (name.size() > kDatabaseNameChars) {
       return UsageError(ctx, *this, "a database name has at most 19 characters");
     }

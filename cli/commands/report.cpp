@@ -13,19 +13,24 @@ class ReportCommand : public Command {
   std::string name() const override { return "report"; }
   std::string summary() const override { return "count, extremes, sum and average of a field"; }
   std::string help() const override {
-    return "Usage: cardovex-cli report FILE FIELD [-o OUT]\n"
+    return "Usage: cardovex-cli report FILE FIELD [-o OUT [--force]]\n"
            "Prints the report of FIELD (a slot number 0-29 or a name) over the records\n"
            "in view, exactly as the Report Results dialog shows it: lines ending in\n"
            "CR LF, tabs as they are. Integer, Float, Check-Box, Time, Date and\n"
            "Calculated fields have reports.\n"
            "  -o OUT   write the report to OUT instead (Windows-1252, followed by one\n"
-           "           LF), as the dialog's Export does\n";
+           "           LF), as the dialog's Export does; a FIFO or device is written\n"
+           "           into\n"
+           "  --force  write OUT even when it is a database or FILE itself\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"-o"}, {});
+    Args args(argv, {"-o"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE FIELD");
+    if (auto out = args.value("-o"); out && !TextTargetAllowed(ctx, args, *out, args.positional()[0])) {
+      return kExitFailed;
+    }
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     const int slot = ResolveField(db, args.positional()[1]);

@@ -36,6 +36,12 @@ class SecurityCommand : public Command {
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();
     if (p.empty() || p.size() % 2 == 0) return UsageError(ctx, *this, "expected FILE [OPERATION LEVEL ...]");
+    if (p.size() == 1 && !args.has("--set-password")) {
+      DatabaseHead head;
+      if (!OpenHeadForCommand(ctx, p[0], head)) return kExitFailed;
+      Show(ctx, LoadSecuritySettings(head.schema));
+      return kExitOk;
+    }
     Database db;
     if (!OpenForCommand(ctx, p[0], db)) return kExitFailed;
 
@@ -54,14 +60,13 @@ class SecurityCommand : public Command {
       settings.levels[op] = level;
     }
     if (auto pw = args.value("--set-password")) {
-      settings.password = Utf8ToCp1252(*pw);
+      std::string error;
+      if (!ToStoredText(*pw, "--set-password", settings.password, error)) {
+        return UsageError(ctx, *this, error);
+      }
       if (settings.password.size() > 19) {
         return UsageError(ctx, *this, "a password has at most 19 characters");
       }
-    }
-    if (p.size() == 1 && !args.has("--set-password")) {
-      Show(ctx, settings);
-      return kExitOk;
     }
     if (!PassAccessCheck(ctx, db, secured::kDBProperties)) return kExitFailed;
     ApplySecuritySettings(db, settings);

@@ -141,7 +141,7 @@ class SetFieldCommand : public Command {
       auto v = args.value(option);
       if (!v) return true;
       any = true;
-      into = Utf8ToCp1252(*v);
+      if (!ToStoredText(*v, option, into, error)) return false;
       if (into.size() > limit) {
         error = std::string(option) + " takes at most " + std::to_string(limit) + " characters";
         return false;

@@ -46,7 +46,9 @@ class SortCommand : public Command {
       int field = -1;
       bool forward = true;
       std::string error;
-      if (!ParseSortKeyText(db.schema(), Utf8ToCp1252(p[k + 1]), field, forward, error)) {
+      const std::optional<std::string> key = StoredTextOrNothing(p[k + 1]);
+      if (!key) return UsageError(ctx, *this, "no field " + p[k + 1]);
+      if (!ParseSortKeyText(db.schema(), *key, field, forward, error)) {
         return UsageError(ctx, *this, Cp1252ToUtf8(error));
       }
       choice.entry[k] = field + 1;

@@ -5,10 +5,23 @@
 #include <ostream>
 #include <string_view>
 
+#include "cli/args.h"
+#include "cli/command.h"
 #include "ops/text_sink.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {
+
+// False (after the message) when `out` is a database or the input file
+// `in` and --force was not given.
+inline bool TextTargetAllowed(Context& ctx, const Args& args, const std::string& out,
+                              const std::string& in) {
+  if (args.has("--force")) return true;
+  Status s = CheckTextTarget(out, {in});
+  if (s) return true;
+  Failure(ctx, s.message() + " (--force writes it anyway)");
+  return false;
+}
 
 class Utf8StreamSink : public TextSink {
  public:

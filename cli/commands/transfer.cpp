@@ -31,13 +31,17 @@ class TransferCommand : public Command {
                     "after passing FILE's \"Delete Records\" access check.\n"
                   : "Copying to FILE itself duplicates the records.\n") +
            "TARGET must pass its \"Open Database\" and \"Add Records\" access checks\n"
-           "(one --password serves every prompt).\n";
+           "(one --password serves every prompt).\n" +
+           (move_ ? "Nothing leaves FILE unless TARGET was saved first; when TARGET cannot be\n"
+                    "saved the command fails and both files stay as they were.\n"
+                  : "");
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--record"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TARGET");
+    if (!LockDatabases(ctx, {args.positional()[0], args.positional()[1]})) return kExitFailed;
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     TransferWhich which;
@@ -53,7 +57,7 @@ class TransferCommand : public Command {
     DataSession session(db, ctx.locale, ctx.ui);
     LinkServices services = SecuredLinkServices(ctx.ui, &ctx.locale);
     TransferResult result = TransferRecordsTo(move_, which, session, args.positional()[1], services);
-    if (!result.done) return kExitFailed;
+    if (!result.done || result.failed) return kExitFailed;
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
     ctx.out << result.copied << (result.copied == 1 ? " record" : " records") << " copied";
     if (move_) ctx.out << ", " << result.deleted << " removed from " << args.positional()[0];

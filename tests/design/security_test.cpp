@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "tests/design/design_db.h"
+#include "tests/engine/test_databases.h"
 #include "tests/support/test_support.h"
 
 namespace cx {
@@ -163,10 +164,31 @@ TEST_F(OpenAccess, PasswordFromTheFileAndQuietCancel) {
   EXPECT_EQ(ui.passwordPrompts, 2);
 }
 
-TEST_F(OpenAccess, UnreadableFileIsLeftToTheOpen) {
+TEST_F(OpenAccess, UnreadableFileIsRefusedWithTheOpensMessage) {
   ASSERT_TRUE(WriteFileSafely(dir.File("junk.PDB"), "not a database", 14).ok());
-  EXPECT_TRUE(CheckOpenAccess(dir.File("junk.PDB"), ui));
-  EXPECT_TRUE(ui.messages.empty());
+  EXPECT_FALSE(CheckOpenAccess(dir.File("junk.PDB"), ui));
+  ASSERT_EQ(ui.messages.size(), 1u);
+  EXPECT_EQ(ui.messages[0].text, messages::kBadHeader);
+}
+
+// The check must read the schema exactly as the open does: a schema record
+// the open accepts (here one of the largest size) may not slip past it.
+TEST_F(OpenAccess, LargestSchemaRecordStillAsksForThePassword) {
+  Schema schema = InitSchema();
+  schema.password.set("guard");
+  SetLevel(schema, secured::kOpenDatabase, access_level::kPassword);
+  std::vector<testing::RawRecord> records = testing::StandardRecords(schema);
+  records[0].bytes.resize(format::kMaxRecordSize, 0);
+  records.push_back({testing::ByteVector{0, 2, 0, 'x', 0, 0xFF, 0xFF}, 0, 0});
+  const std::string path = dir.File("Big.PDB");
+  ASSERT_TRUE(testing::WriteBytes(path, testing::BuildPdb(records)));
+  Database opened;
+  ASSERT_TRUE(opened.Open(path, ui).ok());
+  EXPECT_EQ(OpenLevel(path), 1);
+  EXPECT_FALSE(CheckOpenAccess(path, ui));
+  EXPECT_EQ(ui.passwordPrompts, 1);
+  ui.passwordAnswers = {{"guard"}};
+  EXPECT_TRUE(CheckOpenAccess(path, ui));
 }
 
 TEST(SecuritySettingsDialog, StoresPasswordAndLevelsKeepingTheHiddenRow) {

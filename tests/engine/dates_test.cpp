@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <chrono>
 
 #include "engine/dates.h"
@@ -50,6 +51,29 @@ TEST(DatesTest, NoCenturyRuleAfter2099) {
   // The two directions stay each other's inverse far beyond 2099.
   for (uint32_t n = feb28 - 400; n < feb28 + 40000; ++n) {
     ASSERT_EQ(DateToDayNumber(DayNumberToDate(n)), n) << DayNumberToDate(n);
+  }
+}
+
+// Day numbers are unsigned 32-bit: every one of them is a real date, the
+// day after the one before, however far past 2099 it lies.
+TEST(DatesTest, EveryThirtyTwoBitDayIsTheDayAfterThePrevious) {
+  EXPECT_EQ(DayNumberToDate(0xFFFFFFFFu), (CalendarDate{11760883, 8, 4}));
+  auto next = [](CalendarDate d) {
+    static constexpr int kLength[12] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    const int length = kLength[d.month - 1] + (d.month == 2 && d.year % 4 == 0 ? 1 : 0);
+    if (++d.day > length) d.day = 1, ++d.month;
+    if (d.month > 12) d.month = 1, ++d.year;
+    return d;
+  };
+  // Windows spread over the range, the last one ending at the top.
+  for (uint64_t start = 0; start <= 0xFFFFFFFFull; start += 0xFFFFFFFFull / 64) {
+    const uint32_t first = static_cast<uint32_t>(std::min<uint64_t>(start, 0xFFFFFFFFull - 3000));
+    CalendarDate expected = DayNumberToDate(first);
+    ASSERT_EQ(DateToDayNumber(expected), first) << expected;
+    for (uint32_t n = first + 1; n - first <= 3000; ++n) {
+      expected = next(expected);
+      ASSERT_EQ(DayNumberToDate(n), expected) << "day " << n;
+    }
   }
 }
 

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <fcntl.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -286,6 +287,105 @@ TEST_F(StoreTest, NextUniqueNumber) {
   db.ReplaceRecord(0, SlotWriter().Number(5).Number(400).End().bytes);
   EXPECT_EQ(db.TakeUniqueNumber(), 401u);
   EXPECT_EQ(db.TakeUniqueNumber(), 402u);
+}
+
+}  // namespace
+}  // namespace cx
+
+namespace cx {
+namespace {
+
+class SaveGuardTest : public StoreTest {};
+
+std::string TextValue(ByteView record, int slot) {
+  auto v = FieldValue(record, slot);
+  return v ? ValueString(*v) : "<none>";
+}
+
+TEST_F(SaveGuardTest, FileChangedOnDiskSinceOpeningIsNotReplaced) {
+  Database first = MakeFilled("shared.PDB");
+  ASSERT_TRUE(first.Save(FixedClock(1)).ok());
+  const std::string path = first.path();
+  Database mine, theirs;
+  ASSERT_TRUE(mine.Open(path, ui).ok());
+  ASSERT_TRUE(theirs.Open(path, ui).ok());
+  theirs.AppendRecord(SlotWriter().Text("theirs").End().bytes);
+  ASSERT_TRUE(theirs.Save(FixedClock(2)).ok());
+  // Saving twice in a row is no change by somebody else.
+  theirs.MarkChanged();
+  ASSERT_TRUE(theirs.Save(FixedClock(3)).ok());
+
+  mine.AppendRecord(SlotWriter().Text("mine").End().bytes);
+  EXPECT_TRUE(mine.ChangedOnDisk());
+  Status s = mine.Save(FixedClock(4));
+  ASSERT_FALSE(s.ok());
+  EXPECT_NE(s.message().find(path), std::string::npos) << s.message();
+  EXPECT_TRUE(mine.changed());
+  Database check;
+  ASSERT_TRUE(check.Open(path, ui).ok());
+  ASSERT_EQ(check.recordCount(), 4u);
+  EXPECT_EQ(TextValue(check.record(3), 0), "theirs");
+
+  // The user chose this version over the other.
+  mine.AcceptDiskState();
+  ASSERT_TRUE(mine.Save(FixedClock(5)).ok());
+  ASSERT_TRUE(check.Open(path, ui).ok());
+  EXPECT_EQ(TextValue(check.record(3), 0), "mine");
+}
+
+TEST_F(SaveGuardTest, RewriteInPlaceWithTheSameSizeIsNoticed) {
+  Database first = MakeFilled("touched.PDB");
+  ASSERT_TRUE(first.Save(FixedClock(1)).ok());
+  Database mine;
+  ASSERT_TRUE(mine.Open(first.path(), ui).ok());
+  // Same file, same size: only the time of the change tells, to the
+  // nanosecond.
+  struct stat st{};
+  ASSERT_EQ(::stat(first.path().c_str(), &st), 0);
+  timespec times[2] = {st.st_atim, st.st_mtim};
+  times[1].tv_nsec = (times[1].tv_nsec + 1) % 1000000000;
+  ASSERT_EQ(::utimensat(AT_FDCWD, first.path().c_str(), times, 0), 0);
+  mine.MarkChanged();
+  EXPECT_FALSE(mine.Save(FixedClock(2)).ok());
+  // Saved elsewhere, it is a new file of its own.
+  ASSERT_TRUE(mine.SaveAs(dir.File("copy.PDB"), FixedClock(3)).ok());
+  mine.MarkChanged();
+  EXPECT_TRUE(mine.Save(FixedClock(4)).ok());
+}
+
+TEST_F(SaveGuardTest, SaveThroughALinkReplacesTheFileItPointsAt) {
+  ASSERT_EQ(::mkdir(dir.File("real").c_str(), 0700), 0);
+  Database first = MakeFilled("real/Data.PDB");
+  ASSERT_TRUE(first.Save(FixedClock(1)).ok());
+  ASSERT_EQ(::symlink("real/Data.PDB", dir.File("Link.PDB").c_str()), 0);
+  Database viaLink;
+  ASSERT_TRUE(viaLink.Open(dir.File("Link.PDB"), ui).ok());
+  viaLink.DeleteRecord(0);
+  ASSERT_TRUE(viaLink.Save(FixedClock(2)).ok());
+  struct stat st{};
+  ASSERT_EQ(::lstat(dir.File("Link.PDB").c_str(), &st), 0);
+  EXPECT_TRUE(S_ISLNK(st.st_mode));
+  Database check;
+  ASSERT_TRUE(check.Open(dir.File("real/Data.PDB"), ui).ok());
+  EXPECT_EQ(check.recordCount(), 2u);
+  // And again: the state recorded at the last save is the linked file's.
+  viaLink.DeleteRecord(0);
+  ASSERT_TRUE(viaLink.Save(FixedClock(3)).ok());
+}
+
+TEST_F(SaveGuardTest, ReadOnlyDatabaseIsNotRewritten) {
+  Database first = MakeFilled("ro-file.PDB");
+  ASSERT_TRUE(first.Save(FixedClock(1)).ok());
+  const ByteVector before = ReadBytes(first.path());
+  ASSERT_EQ(::chmod(first.path().c_str(), 0444), 0);
+  Database db;
+  ASSERT_TRUE(db.Open(first.path(), ui).ok());
+  db.DeleteRecord(0);
+  Status s = db.Save(FixedClock(2));
+  ASSERT_FALSE(s.ok());
+  EXPECT_NE(s.message().find(first.path()), std::string::npos) << s.message();
+  EXPECT_NE(s.message().find("read-only"), std::string::npos) << s.message();
+  EXPECT_EQ(ReadBytes(first.path()), before);
 }
 
 }  // namespace

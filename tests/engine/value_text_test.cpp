@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include "engine/dates.h"
 #include "engine/value_text.h"
 #include "tests/engine/test_databases.h"
 
@@ -34,6 +35,12 @@ TEST(DateTextTest, FollowsTheShortDatePattern) {
 TEST(DateTextTest, DayZeroIsNoDate) {
   EXPECT_EQ(DateText(0, Dates("M/d/yyyy", '/')), "NO DATE");
   EXPECT_EQ(DateText(0, Dates("dd.MM.yy", '.')), "NO DATE");
+}
+
+TEST(DateTextTest, YearsPastTheFourDigitsPrintInFull) {
+  EXPECT_EQ(DateText(0xFFFFFFFFu, Dates("dd.MM.yyyy", '.')), "04.08.11760883");
+  EXPECT_EQ(DateText(0xFFFFFFFFu, Dates("d/M/yy", '/')), "4/8/83");
+  EXPECT_EQ(DateText(DateToDayNumber({2031, 12, 31}), Dates("M/d/yyyy", '/')), "12/31/2031");
 }
 
 TEST(TimeTextTest, TwentyFourHourPatterns) {
@@ -103,6 +110,16 @@ TEST_F(ValueTextTest, EveryType) {
                             "1:07:05 PM", "12", "9", "note\r\nline", "", "Other", "1:02:05",
                             "1/1/1905", "2.50", "Error!", ""};
   for (int slot = 0; slot < 19; ++slot) EXPECT_EQ(Text(record, slot), expected[slot]) << slot;
+}
+
+TEST_F(ValueTextTest, CalculatedDateOfALargeDayNumber) {
+  auto calculated = [](const char* stored) {
+    SlotWriter w;
+    for (int slot = 0; slot < 15; ++slot) w.Empty();
+    return w.Text(stored).End().bytes;
+  };
+  EXPECT_EQ(Text(calculated("4294967295"), 15), "8/4/11760883");
+  EXPECT_EQ(Text(calculated("10000000"), 15), "7/5/29282");
 }
 
 TEST_F(ValueTextTest, PopupAndCheckBoxValues) {

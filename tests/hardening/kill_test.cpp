@@ -119,7 +119,7 @@ TEST(KillTest, FileIsAlwaysOldOrNewVersion) {
     std::vector<std::string> others = Leftovers(dir, target);
     ASSERT_LE(others.size(), 1u) << "kill " << kill;
     for (const std::string& name : others) {
-      EXPECT_EQ(name.rfind(target + ".tmp-", 0), 0u) << name;
+      EXPECT_TRUE(IsTemporaryNameFor(target, name)) << name;
       EXPECT_FALSE(name.size() >= 4 && (name.substr(name.size() - 4) == ".PDB" ||
                                         name.substr(name.size() - 4) == ".pdb"))
           << name;

@@ -4,6 +4,7 @@
 
 #include <thread>
 
+#include "design/receive_access.h"
 #include "infrared/beam_commands.h"
 #include "infrared/receiver.h"
 #include "platform/file_io.h"
@@ -32,7 +33,7 @@ class Installation {
     options.server.packetTimeoutMs = 5000;
     thread_ = std::thread([this, folder, options] {
       status = ReceiveIntoDataFolder(
-          folder, ui, options, stop_,
+          folder, ui, hooks_, options, stop_,
           [this](const std::string& a) {
             address = a;
             ready_ = true;
@@ -56,6 +57,7 @@ class Installation {
   Status status;
 
  private:
+  AccessCheckedReceiveHooks hooks_;
   std::atomic<bool> stop_{false};
   std::atomic<bool> ready_{false};
   std::thread thread_;

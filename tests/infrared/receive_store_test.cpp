@@ -2,9 +2,12 @@
 // inserts, refuses; never writes outside the data folder.
 #include <gtest/gtest.h>
 
+#include "design/receive_access.h"
+#include "design/security.h"
 #include "infrared/beam_payloads.h"
 #include "infrared/obex_format.h"
 #include "infrared/receive_store.h"
+#include "infrared/record_set.h"
 #include "platform/file_io.h"
 #include "tests/infrared/sample_databases.h"
 #include "tests/support/test_support.h"
@@ -40,6 +43,16 @@ ReceivedObject Arrived(const BeamObject& items) {
   return o;
 }
 
+// The same file with its schema record cut to four bytes (the first popup
+// list starts right after them): no open can read it.
+Bytes SchemaCutShort(Bytes file) {
+  uint8_t* first = file.data() + 78;
+  const uint32_t cut = GetU32(first) + 4;
+  uint8_t* second = first + 8;
+  for (int i = 0; i < 4; ++i) second[i] = static_cast<uint8_t>(cut >> (24 - 8 * i));
+  return file;
+}
+
 class Store : public ::testing::Test {
  protected:
   uint8_t Deliver(ReceivedObject object) { return store_.Deliver(object); }
@@ -49,7 +62,7 @@ class Store : public ::testing::Test {
   cx::testing::TempDir dir_;
   cx::testing::ScriptedUi ui_;
   OpenDatabases dbs_{{}, nullptr, dir_.path() + "/there"};
-  ReceiveHooks hooks_;
+  AccessCheckedReceiveHooks hooks_;
   ReceiveStore store_{dbs_, ui_, hooks_, [this](const std::string& l) { lines_.push_back(l); }};
 };
 
@@ -107,6 +120,32 @@ TEST_F(Store, HostileDatabasesStayOutside) {
   EXPECT_EQ(ListFiles(There()), std::vector<std::string>{"Evil.PDB"});
 }
 
+// Only a full open says a database is whole: a good file is never
+// replaced by bytes that merely start like one.
+TEST_F(Store, UnreadableDatabaseNeverReplacesAGoodOne) {
+  const std::string good = WriteSampleDatabase(There(), "Parts.PDB", {TwoTextRecord("a", "b")});
+  Bytes original;
+  ASSERT_TRUE(ReadWholeFile(good, original));
+  BeamObject object;
+  ASSERT_TRUE(DatabaseObject(good, object));
+  const ReceivedObject whole = Arrived(object);
+  ui_.yesNoAnswers = {true, true, true};
+  const std::vector<Bytes> bodies = {
+      Bytes(whole.body.begin(), whole.body.begin() + 100),  // cut inside the entry list
+      SchemaCutShort(whole.body),
+  };
+  for (const Bytes& body : bodies) {
+    ReceivedObject o = whole;
+    o.body = body;
+    EXPECT_EQ(Deliver(o), kUnsupportedType);
+    EXPECT_EQ(ui_.messages.back().text, "The received file Parts.PDB is not a Cardovex database.");
+  }
+  EXPECT_TRUE(ui_.questions.empty());
+  Bytes after;
+  ASSERT_TRUE(ReadWholeFile(good, after));
+  EXPECT_EQ(after, original);
+}
+
 TEST_F(Store, OpenDatabaseIsNotReplaced) {
   std::string path = WriteSampleDatabase(There(), "Parts.PDB", {});
   Database open;
@@ -160,6 +199,57 @@ TEST_F(Store, RecordsWithoutTheirDatabaseOrDamagedAreRefused) {
   damaged.body = {'C', 'X', 'M', '1', 0, 2, 0, 1, 0};
   EXPECT_EQ(Deliver(damaged), kBadRequest);
   EXPECT_TRUE(RecordsOf(target).empty());
+}
+
+// A receive is an addition like any other: the target's "Open Database"
+// and "Add Records" levels apply, a password is asked once per object.
+TEST_F(Store, RecordsPassTheTargetsAccessChecks) {
+  const std::string target = WriteSampleDatabase(There(), "Parts.PDB", {});
+  auto guard = [&](int op, int level) {
+    SilentUi quiet;
+    Database db;
+    ASSERT_TRUE(db.Open(target, quiet).ok());
+    db.schema().securityLevels = 0;
+    db.schema().password.set("pw");
+    SetLevel(db.schema(), op, level);
+    ASSERT_TRUE(db.Save().ok());
+  };
+  ReceivedObject one;
+  one.name = "Parts.cxr";
+  one.body = TwoTextRecord("x", "y");
+  ReceivedObject two;
+  two.name = "Parts.cxm";
+  const Bytes a = TwoTextRecord("a", ""), b = TwoTextRecord("b", "");
+  std::vector<Bytes> bodies;
+  ASSERT_TRUE(PackRecordSets({a, b}, bodies));
+  ASSERT_EQ(bodies.size(), 1u);
+  two.body = bodies[0];
+
+  for (int op : {secured::kOpenDatabase, secured::kAddRecords}) {
+    guard(op, access_level::kNone);
+    ui_.yesNoAnswers = {true};
+    EXPECT_EQ(Deliver(one), kForbidden) << op;
+    EXPECT_TRUE(RecordsOf(target).empty()) << op;
+  }
+  guard(secured::kAddRecords, access_level::kPassword);
+  ui_.yesNoAnswers = {true};
+  EXPECT_EQ(Deliver(two), kForbidden);  // no password given
+  EXPECT_TRUE(RecordsOf(target).empty());
+  const int prompts = ui_.passwordPrompts;
+  ui_.yesNoAnswers = {true};
+  ui_.passwordAnswers = {{"pw"}};
+  EXPECT_EQ(Deliver(two), kSuccess);
+  EXPECT_EQ(ui_.passwordPrompts, prompts + 1);
+  EXPECT_EQ(RecordsOf(target).size(), 2u);
+
+  // An open database is checked too, in memory.
+  guard(secured::kAddRecords, access_level::kNone);
+  Database open;
+  ASSERT_TRUE(open.Open(target, ui_).ok());
+  dbs_.open.push_back(&open);
+  ui_.yesNoAnswers = {true};
+  EXPECT_EQ(Deliver(one), kForbidden);
+  EXPECT_EQ(open.recordCount(), 2u);
 }
 
 TEST_F(Store, OpenButNotShownDatabaseIsMarkedForResorting) {

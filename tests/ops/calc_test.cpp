@@ -1,7 +1,10 @@
 #include <gtest/gtest.h>
 
+#include <cmath>
+
 #include "ops/calc.h"
 #include "ops/database_settings.h"
+#include "ops/field_values.h"
 #include "ops/open_database.h"
 #include "ops/sort.h"
 #include "tests/ops/data_ops_fixture.h"
@@ -44,6 +47,21 @@ TEST(CalcResultTest, OperationsAndFormats) {
   LocaleInfo comma;
   comma.decimalSeparator = ',';
   EXPECT_EQ(CalcResultText(2.5, k4Places, comma), "2,5000");
+}
+
+TEST(CalcOperandTest, TextWithoutANumberIsPositiveZero) {
+  for (const char* text : {"-\"9 a", "-abc", "-", " -.", "+x", ""}) {
+    const double value = ParseDouble(text);
+    EXPECT_EQ(value, 0.0) << text;
+    EXPECT_FALSE(std::signbit(value)) << text;
+  }
+  // A zero that was read keeps its sign, as the C library's does.
+  EXPECT_TRUE(std::signbit(ParseDouble("-0")));
+  EXPECT_TRUE(std::signbit(ParseDouble("-0x")));
+  EXPECT_EQ(ParseDouble("-2.5e1x"), -25.0);
+  LocaleInfo comma;
+  comma.decimalSeparator = ',';
+  EXPECT_EQ(CalcResultText(ApplyOperation(kMax, ParseDouble("-\"9 a"), 0.0), k4Places, comma), "0,0000");
 }
 
 TEST(CalcOperandTest, EveryTypeGivesANumber) {

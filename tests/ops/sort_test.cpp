@@ -4,6 +4,7 @@
 
 #include "ops/compare.h"
 #include "ops/database_settings.h"
+#include "ops/position_sort.h"
 #include "ops/sort.h"
 #include "tests/ops/data_ops_fixture.h"
 
@@ -16,48 +17,17 @@ using testing::TestDb;
 using testing::Text;
 using testing::TimeVal;
 
-// The whole-table sort written straight from its description: the
-// quicksort over the record table itself, comparing with CompareRecords,
-// which walks both records' slots on every call. SortAll must put the
-// records in exactly this order.
+// The whole-table sort written straight from its description: the record
+// table itself put in order with CompareRecords, which walks both records'
+// slots on every call. SortAll, which compares rows of prepared keys
+// instead, must put the records in exactly this order.
 void ReferenceSortAll(Database& db) {
   std::vector<DataRecord>& t = db.table();
   const long n = static_cast<long>(t.size());
   if (db.schema().sortKey[0].Field() == -1 || n < 2) return;
-  auto cmp = [&](const DataRecord& a, const DataRecord& b) { return CompareRecords(db, a.bytes(), b.bytes()); };
-  std::vector<std::pair<long, long>> stack;
-  long lo = 0, hi = n - 1;
-  for (;;) {
-    while (hi > lo) {
-      const long mid = (lo + hi) / 2;
-      if (cmp(t[lo], t[mid]) > 0) std::swap(t[lo], t[mid]);
-      if (cmp(t[lo], t[hi]) > 0) std::swap(t[lo], t[hi]);
-      if (cmp(t[mid], t[hi]) > 0) std::swap(t[mid], t[hi]);
-      if (hi - lo < 3) break;
-      std::swap(t[mid], t[hi - 1]);
-      const DataRecord pivot = t[hi - 1];
-      long i = lo, j = hi - 1;
-      for (;;) {
-        while (++i < hi - 1 && cmp(t[i], pivot) < 0) {
-        }
-        while (--j > lo && cmp(t[j], pivot) > 0) {
-        }
-        if (j < i) break;
-        std::swap(t[i], t[j]);
-      }
-      std::swap(t[i], t[hi - 1]);
-      if (j - lo <= hi - i) {
-        stack.push_back({i + 1, hi});
-        hi = j;
-      } else {
-        stack.push_back({lo, j});
-        lo = i + 1;
-      }
-    }
-    if (stack.empty()) break;
-    std::tie(lo, hi) = stack.back();
-    stack.pop_back();
-  }
+  SortPositions(
+      n, [&](long x, long y) { return CompareRecords(db, t[x].bytes(), t[y].bytes()); },
+      [&](long x, long y) { std::swap(t[x], t[y]); });
 }
 
 void SetKeys(Database& db, std::initializer_list<std::pair<int, int>> keys) {
@@ -306,6 +276,47 @@ TEST(SortAllTest, FullSizeTableEndsSorted) {
   SortAll(t.db);
   for (size_t i = 1; i < t.db.recordCount(); ++i) {
     ASSERT_LE(CompareRecords(t.db, t.db.record(i - 1), t.db.record(i)), 0) << i;
+  }
+}
+
+// An adversary that fixes each value only when a comparison forces it,
+// always so that the pivot looks as bad as possible: the arrangement it
+// leaves behind drives a plain median-of-three quicksort to n² comparisons.
+TEST(SortAllTest, AdversarialArrangementStaysWithinNLogN) {
+  for (const long n : {1000L, 4096L, 10007L}) {
+    const long gas = n;
+    std::vector<long> value(static_cast<size_t>(n), gas);
+    std::vector<long> item(static_cast<size_t>(n));
+    for (long i = 0; i < n; ++i) item[static_cast<size_t>(i)] = i;
+    long solid = 0, candidate = -1, comparisons = 0;
+    auto compare = [&](long x, long y) {
+      ++comparisons;
+      long& a = value[static_cast<size_t>(item[static_cast<size_t>(x)])];
+      long& b = value[static_cast<size_t>(item[static_cast<size_t>(y)])];
+      if (a == gas && b == gas) {
+        if (item[static_cast<size_t>(x)] == candidate) {
+          a = solid++;
+        } else {
+          b = solid++;
+        }
+      }
+      if (a == gas) {
+        candidate = item[static_cast<size_t>(x)];
+      } else if (b == gas) {
+        candidate = item[static_cast<size_t>(y)];
+      }
+      return a < b ? -1 : (a > b ? 1 : 0);
+    };
+    auto swap = [&](long x, long y) { std::swap(item[static_cast<size_t>(x)], item[static_cast<size_t>(y)]); };
+    SortPositions(n, compare, swap);
+    long log2 = 0;
+    while ((1L << log2) < n) ++log2;
+    EXPECT_LT(comparisons, 6 * n * log2) << n << " items";
+    for (long i = 1; i < n; ++i) {
+      ASSERT_LE(value[static_cast<size_t>(item[static_cast<size_t>(i - 1)])],
+                value[static_cast<size_t>(item[static_cast<size_t>(i)])])
+          << "position " << i << " of " << n;
+    }
   }
 }
 

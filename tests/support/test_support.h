@@ -25,6 +25,29 @@ class TempDir {
   std::string path_;
 };
 
+// A small tmpfs mounted on a fresh folder, in a mount namespace of this
+// process's own so that it goes away with the process even when a test
+// dies: a disk that fills up. ok() is false where mounting is not allowed
+// (not the administrator, no namespaces); why() then says so.
+class SmallTmpfs {
+ public:
+  explicit SmallTmpfs(size_t bytes);
+  ~SmallTmpfs();
+  SmallTmpfs(const SmallTmpfs&) = delete;
+  SmallTmpfs& operator=(const SmallTmpfs&) = delete;
+  bool ok() const { return mounted_; }
+  const std::string& why() const { return why_; }
+  const std::string& path() const { return dir_.path(); }
+  std::string File(const std::string& name) const { return dir_.File(name); }
+  // Fills what is left with a file of its own; false if it never filled.
+  bool FillUp();
+
+ private:
+  TempDir dir_;
+  bool mounted_ = false;
+  std::string why_;
+};
+
 // Records every message, question and file dialog, and answers from queues
 // (an empty queue answers No, Cancel, or cancels the dialog).
 class ScriptedUi : public UiPort {

@@ -428,15 +428,40 @@ std::optional<std::string> Workspace::AskSavePath(const Document& doc, const std
   return context_.ui.ChooseSaveFile(request);
 }
 
+bool Workspace::WouldReplaceOtherChanges(const Document& doc, const std::string& path) const {
+  if (doc.neverSaved() || !doc.db().ChangedOnDisk()) return false;
+  std::error_code ec;
+  return path == doc.path() || std::filesystem::equivalent(path, doc.path(), ec);
+}
+
+void Workspace::KeepCopy(Document& doc, const std::string& original) {
+  const std::string copy = FreeDefaultFileName(doc);
+  if (!SaveDocument(doc, copy, false)) return;
+  // Both names go in at once: a path may itself hold "%s".
+  std::string text = file_messages::kKeptCopy;
+  const size_t first = text.find("%s");
+  text.replace(first, 2, original);
+  text.replace(text.find("%s", first + original.size()), 2, copy);
+  context_.ui.ShowMessage(text, file_messages::kUpdate, MessageIcon::Warning);
+}
+
 bool Workspace::SaveDocument(Document& doc, const std::string& path, bool reportSuccess) {
   UiPort& ui = context_.ui;
+  if (WouldReplaceOtherChanges(doc, path)) {
+    // The user decides whose version wins; No leaves everything as it is,
+    // the database still open and marked changed.
+    ui.SetBusy(false);
+    if (!ui.AskYesNo(Substitute(file_messages::kReplaceOther, path), file_messages::kQuestion)) return false;
+    doc.db().AcceptDiskState();
+  }
   Status status;
   if (path.find('*') != std::string::npos) {
     status = Status::Error(file_messages::kSaveFailed);
   } else {
     BusyScope busy(ui);
-    doc.db().SetPath(path);
-    status = doc.db().Save(context_.clock);
+    // SaveAs and not SetPath + Save: a different target is no reason to
+    // compare with the state of the file this database came from.
+    status = doc.db().SaveAs(path, context_.clock);
   }
   if (!status) {
     ui.ShowMessage(file_messages::kSaveFailed, file_messages::kUpdate, MessageIcon::Error);
@@ -458,12 +483,17 @@ bool Workspace::DecideSave(Document& doc, SaveDecisionMode mode) {
 
   if (mode.silent || (autoSave && !never)) {
     const std::string path = never ? FreeDefaultFileName(doc) : doc.path();
+    // A save nobody watches never replaces another program's version.
+    if (mode.silent && WouldReplaceOtherChanges(doc, path)) {
+      KeepCopy(doc, path);
+      return true;
+    }
     if (SaveDocument(doc, path, false)) return true;
     // A command that can stop does, and the user decides. Without a user
     // to ask, a copy in the data folder keeps the changes (the original
     // file may be the one that cannot be written).
     if (mode.cancellable) return false;
-    if (!never) SaveDocument(doc, FreeDefaultFileName(doc), false);
+    if (!never) KeepCopy(doc, path);
     return true;
   }
 

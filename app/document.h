@@ -301,6 +301,12 @@ class Workspace {
  private:
   std::unique_ptr<Document> MakeDocument(int level);
   bool SaveDocument(Document& doc, const std::string& path, bool reportSuccess);
+  // True when saving `doc` to `path` would replace a file another program
+  // changed after it was read here.
+  bool WouldReplaceOtherChanges(const Document& doc, const std::string& path) const;
+  // Without a user to ask: the changes go into a free name in the data
+  // folder, and the user is told where.
+  void KeepCopy(Document& doc, const std::string& original);
   std::optional<std::string> AskSavePath(const Document& doc, const std::string& proposed);
   std::string FreeDefaultFileName(const Document& doc) const;
   bool DecideAllLevels(SaveDecisionMode mode);
@@ -328,6 +334,11 @@ inline constexpr const char* kNeverSaved = "Database (%s) has never been saved. 
 inline constexpr const char* kHasChanged = "File (%s) has changed.  Save Changes?";
 inline constexpr const char* kOpenTitle = "Cardovex";
 inline constexpr const char* kSaveTitle = "Save As";
+inline constexpr const char* kReplaceOther =
+    "%s was changed by another program after it was opened here.\n\nReplace that version with "
+    "this one? (No keeps this database open with its changes.)";
+inline constexpr const char* kKeptCopy =
+    "%s could not be replaced, so the changes made here were kept in a copy:\n%s";
 inline constexpr const char* kDefaultSuffix = "PDB";
 inline constexpr const char* kReportTypes =
     "Can only run reports on the following field types:\nInteger, Float, Checkbox, Time, Date, and "

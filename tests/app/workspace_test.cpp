@@ -203,9 +203,54 @@ TEST_F(WorkspaceTest, ShutdownKeepsChangesThatCannotGoToTheirFile) {
   Document& doc = OpenChanged(WritePeople());
   doc.db().SetPath(dir.File("gone/People.PDB"));
   workspace.Shutdown();
-  ASSERT_EQ(ui.messages.size(), 1u);
+  ASSERT_EQ(ui.messages.size(), 2u);
   EXPECT_EQ(ui.messages[0].text, "ERROR:File could not be saved");
+  EXPECT_NE(ui.messages[1].text.find(dir.File("People1.PDB")), std::string::npos);
   EXPECT_EQ(Reread(dir.File("People1.PDB")).schema().field[1].width, 0);
+}
+
+// Another program rewrites the file while it is open here.
+TEST_F(WorkspaceTest, AFileChangedOnDiskIsReplacedOnlyWhenTheUserSaysSo) {
+  const std::string path = WritePeople();
+  auto otherProgram = [&] {
+    WriteDatabase("People", {{"Theirs", FieldType::Text}}, {{"x"}});
+    return FileBytes(path);
+  };
+  Document& doc = OpenChanged(path);
+  const auto theirs = otherProgram();
+
+  ui.yesNoAnswers = {false};
+  EXPECT_FALSE(workspace.Save());
+  ASSERT_EQ(ui.questions.size(), 1u);
+  EXPECT_NE(ui.questions[0].text.find(path), std::string::npos);
+  EXPECT_TRUE(ui.messages.empty()) << ui.messages[0].text;
+  EXPECT_TRUE(doc.changed());
+  EXPECT_EQ(workspace.shown(), &doc);
+  EXPECT_EQ(FileBytes(path), theirs);
+
+  ui.yesNoAnswers = {true};
+  EXPECT_TRUE(workspace.Save());
+  EXPECT_FALSE(doc.changed());
+  EXPECT_EQ(Reread(path).schema().field[1].width, 0);
+
+  // Once saved, the file is ours again: no question.
+  doc.HideField(0);
+  ui.questions.clear();
+  EXPECT_TRUE(workspace.Save());
+  EXPECT_TRUE(ui.questions.empty());
+
+  // Nobody is asked at shutdown: their version stays, ours goes beside it.
+  doc.MarkChanged();
+  const auto theirsAgain = otherProgram();
+  ui.messages.clear();
+  workspace.Shutdown();
+  EXPECT_TRUE(ui.questions.empty());
+  EXPECT_EQ(FileBytes(path), theirsAgain);
+  const std::string copy = dir.File("People1.PDB");
+  EXPECT_EQ(Reread(copy).schema().field[0].width, 0);
+  ASSERT_EQ(ui.messages.size(), 1u);
+  EXPECT_NE(ui.messages[0].text.find(copy), std::string::npos);
+  EXPECT_NE(ui.messages[0].text.find(path), std::string::npos);
 }
 
 TEST_F(WorkspaceTest, SaveCommand) {

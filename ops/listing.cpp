@@ -1,6 +1,7 @@
 #include "ops/listing.h"
 
 #include "engine/value_text.h"
+#include "ops/text_sink.h"
 #include "platform/data_folder.h"
 
 namespace cx {
@@ -68,6 +69,10 @@ bool ExportRecordsText(const Database& db, bool all, size_t current, UiPort& ui,
   if (!chosen) return false;
   std::string path = *chosen;
   if (FileNamePart(path).find('.') == std::string::npos) path += ".TXT";
+  if (Status s = CheckTextTarget(path, {db.path()});
+      !s && !ui.AskYesNo(s.message() + ".\n\nWrite the text there anyway?", "QUESTION")) {
+    return false;
+  }
   ui.SetBusy(true);
   Status written = WriteListingFile(db, all, current, path, ctx, link);
   ui.SetBusy(false);

@@ -123,6 +123,7 @@ void RunReportCommand(QWidget* parent, const DataTarget& t, int field) {
     }
     if (!text) return;
     ReportResultsDialog results(*text, parent);
+    results.setSourcePath(t.session.db.path());
     if (results.exec() != ReportResultsDialog::kNewReport) return;
     // "New Report" offers the field choice again, on the field just shown.
     last = field;
@@ -135,6 +136,7 @@ bool ExportCsvCommand(QWidget* parent, const DataTarget& t) {
   const QString folder = QString::fromStdString(t.folder.empty() ? QDir::homePath().toStdString() : t.folder);
   CsvExportDialog dialog(folder + "/" + (base.isEmpty() ? "Export" : base) + ".csv", parent);
   if (dialog.exec() != QDialog::Accepted) return false;
+  if (!ConfirmTextTarget(parent, dialog.path().toStdString(), {t.session.db.path()})) return false;
   std::string error;
   int result;
   {
@@ -175,6 +177,15 @@ bool ImportCsvCommand(QWidget* parent, const DataTarget& t) {
   if (!result.status) text += "\n\n" + FromDb(result.status.message());
   if (result.lines > result.imported && result.status) {
     text += QString("\n%1 lines could not be added.").arg(result.lines - result.imported);
+  }
+  if (!result.issues.empty()) {
+    // Stored all the same, by the import rules: the user should know which
+    // values to look at.
+    text += QString("\n\n%1 %2 values that were not stored as written:")
+                .arg(result.issues.lines)
+                .arg(result.issues.lines == 1 ? "line holds" : "lines hold");
+    for (const std::string& line : result.issues.Describe(t.session.db.schema())) text += "\n" + FromDb(line);
+    if (result.issues.lines > CsvImportIssues::kKeptLines) text += "\n...";
   }
   (void)before;
   if (result.status) {

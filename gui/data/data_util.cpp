@@ -5,6 +5,7 @@
 #include <QStringList>
 
 #include "gui/common/text.h"
+#include "ops/text_sink.h"
 
 namespace cx::gui {
 
@@ -34,6 +35,17 @@ void ShowBox(QWidget* parent, const std::string& text, const std::string& captio
                   QMessageBox::Ok, parent);
   box.setObjectName("dataMessageBox");
   box.exec();
+}
+
+bool ConfirmTextTarget(QWidget* parent, const std::string& path, const std::vector<std::string>& inputs) {
+  const Status s = CheckTextTarget(path, inputs);
+  if (s) return true;
+  QMessageBox box(QMessageBox::Warning, "QUESTION",
+                  FromDb(s.message()) + ".\n\nWrite the text there anyway?", QMessageBox::Yes | QMessageBox::No,
+                  parent);
+  box.setObjectName("textTargetQuestion");
+  box.setDefaultButton(QMessageBox::No);
+  return box.exec() == QMessageBox::Yes;
 }
 
 }  // namespace cx::gui

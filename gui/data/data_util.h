@@ -8,6 +8,7 @@
 #include <QWidget>  // qt_ui_port.h holds a QPointer<QWidget>
 #include <functional>
 #include <string>
+#include <vector>
 
 #include "gui/common/qt_ui_port.h"  // WaitCursor
 #include "ops/database_settings.h"
@@ -53,5 +54,9 @@ struct DataTarget {
 // A modal message box on the GUI thread, captions as the engine writes
 // them (8-bit text).
 void ShowBox(QWidget* parent, const std::string& text, const std::string& caption, bool error);
+
+// Text about to be written to `path`: true when that destroys no database
+// (of this kind, or one of `inputs`), or when the user said to write anyway.
+bool ConfirmTextTarget(QWidget* parent, const std::string& path, const std::vector<std::string>& inputs);
 
 }  // namespace cx::gui

@@ -88,6 +88,7 @@ ReportResultsDialog::ReportResultsDialog(std::string report, QWidget* parent)
 QString ReportResultsDialog::shownText() const { return text_->toPlainText(); }
 
 bool ReportResultsDialog::ExportTo(const std::string& path) {
+  if (!ConfirmTextTarget(this, path, {source_})) return false;
   WaitCursor wait;
   if (Status s = ExportReportText(report_, path); !s) {
     QMessageBox::warning(this, "Error", FromDb(s.message()));

@@ -38,11 +38,15 @@ class ReportResultsDialog : public QDialog {
   // Writes the report to `path` as the export does; false after telling
   // the user why not.
   bool ExportTo(const std::string& path);
+  // The database the report was made from: "Export" asks before writing
+  // over it (or over any other database).
+  void setSourcePath(std::string path) { source_ = std::move(path); }
 
  private:
   void Export();
 
   std::string report_;
+  std::string source_;
   QPlainTextEdit* text_;
 };
 

@@ -12,6 +12,7 @@
 #include <QProcess>
 #include <QComboBox>
 #include <QLineEdit>
+#include <QMessageBox>
 #include <QPrinter>
 #include <QRadioButton>
 #include <QtTest>
@@ -267,6 +268,65 @@ class DataDialogsTest : public QObject {
     QCOMPARE(c.db.recordCount(), before * 2);
     QCOMPARE(c.session.view.size(), before * 2);
     QVERIFY(c.viewChanges > 0);
+  }
+
+  void importSummaryNamesTheLinesStoredOtherwise() {
+    TempDir dir;
+    const std::string src = CopySample("Contacts", dir.path());
+    QFile csv(QString::fromStdString(dir.File("in.csv")));
+    QVERIFY(csv.open(QIODevice::WriteOnly));
+    csv.write("Ann,1,,,1\nZed,2,,,yes\n");
+    csv.close();
+    Open c(src);
+    gui::DataTarget target = c.Target();
+    QString summary;
+    ModalAnswers answers({[&](QWidget* w) {
+                            w->findChild<QLineEdit*>("csvImportPath")->setText(QString::fromStdString(dir.File("in.csv")));
+                            qobject_cast<QDialog*>(w)->accept();
+                          },
+                          [&](QWidget* box) {
+                            summary = qobject_cast<QMessageBox*>(box)->text();
+                            Reject(box);
+                          }});
+    QVERIFY(gui::ImportCsvCommand(nullptr, target));
+    QVERIFY2(summary.contains("2 of 2 lines imported"), qPrintable(summary));
+    QVERIFY2(summary.contains("1 line holds"), qPrintable(summary));
+    QVERIFY2(summary.contains("line 2, field \"Favorite\" (Check-Box): \"yes\""), qPrintable(summary));
+  }
+
+  // A slip in the file dialog must not turn a database into text.
+  void textExportsAskBeforeWritingOverADatabase() {
+    TempDir dir;
+    const std::string src = CopySample("Contacts", dir.path());
+    const std::string other = CopySample("Orders", dir.path());
+    const QByteArray otherBytes = ReadAll(other), srcBytes = ReadAll(src);
+    Open c(src);
+    gui::DataTarget target = c.Target();
+    for (const std::string& victim : {other, src}) {
+      QString asked;
+      ModalAnswers answers({[&](QWidget* w) {
+                              w->findChild<QLineEdit*>("csvExportPath")->setText(QString::fromStdString(victim));
+                              qobject_cast<QDialog*>(w)->accept();
+                            },
+                            [&](QWidget* box) {
+                              asked = box->objectName();
+                              qobject_cast<QMessageBox*>(box)->button(QMessageBox::No)->click();
+                            }});
+      QVERIFY(!gui::ExportCsvCommand(nullptr, target));
+      QCOMPARE(asked, QString("textTargetQuestion"));
+    }
+    QCOMPARE(ReadAll(other), otherBytes);
+    QCOMPARE(ReadAll(src), srcBytes);
+
+    // The report's "Export" asks the same, and Yes writes.
+    gui::ReportResultsDialog results("Report\r\n");
+    results.setSourcePath(src);
+    ModalAnswers no({[](QWidget* box) { qobject_cast<QMessageBox*>(box)->button(QMessageBox::No)->click(); }});
+    QVERIFY(!results.ExportTo(src));
+    QCOMPARE(ReadAll(src), srcBytes);
+    ModalAnswers yes({[](QWidget* box) { qobject_cast<QMessageBox*>(box)->button(QMessageBox::Yes)->click(); }});
+    QVERIFY(results.ExportTo(other));
+    QVERIFY(ReadAll(other).startsWith("Report\r\n"));
   }
 
   void reportShowsAndExportsTheToolsText() {

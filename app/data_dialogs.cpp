@@ -82,9 +82,9 @@ std::string RememberPeer(const std::string& stored, const std::string& peer) {
   return out;
 }
 
-std::string ReceiveAddressOrDefault(const std::optional<std::string>& setting) {
+std::string ReceiveAddressOrDefault(const std::optional<std::string>& setting, const std::string& fallback) {
   if (setting && !CheckReceiveAddress(Trimmed(*setting))) return Trimmed(*setting);
-  return kDesktopReceiveAddress;
+  return fallback;
 }
 
 std::optional<std::string> CheckReceiveAddress(const std::string& address) {

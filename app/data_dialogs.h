@@ -26,10 +26,9 @@ inline constexpr size_t kRememberedPeers = 8;
 std::vector<std::string> RememberedPeers(const std::string& stored);
 std::string RememberPeer(const std::string& stored, const std::string& peer);
 
-// Where "Receive..." listens when the ReceiveAddress setting is unset or
-// unusable: every interface, on a port that needs no privileges.
-inline constexpr char kDesktopReceiveAddress[] = "0.0.0.0:6500";
-std::string ReceiveAddressOrDefault(const std::optional<std::string>& setting);
+// Where "Receive..." listens: the ReceiveAddress setting, or `fallback`
+// (the receiver's own default) when it is unset or unusable.
+std::string ReceiveAddressOrDefault(const std::optional<std::string>& setting, const std::string& fallback);
 // "HOST:PORT" with a port of 0..65535 (0: any free one): nothing, else the
 // message to show.
 std::optional<std::string> CheckReceiveAddress(const std::string& address);

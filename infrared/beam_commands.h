@@ -18,7 +18,9 @@ namespace cx::obex {
 // commas) and the address the receiver listens on.
 inline constexpr char kBeamPeersSetting[] = "BeamPeers";
 inline constexpr char kReceiveAddressSetting[] = "ReceiveAddress";
-inline constexpr char kDefaultReceiveAddress[] = "0.0.0.0:650";
+// Above 1023, so that listening needs no privileges; peers that listen on
+// the classic OBEX port 650 are still reached by naming it.
+inline constexpr char kDefaultReceiveAddress[] = "0.0.0.0:6500";
 
 std::vector<std::string> BeamPeers(const Settings& settings);
 

@@ -15,6 +15,7 @@
 
 #include "gui/common/help.h"
 #include "app/data_dialogs.h"
+#include "design/receive_access.h"
 #include "design/security.h"
 #include "infrared/beam_commands.h"
 #include "infrared/obex_format.h"
@@ -146,13 +147,12 @@ class ReceiveWindow::Sink : public obex::ObjectSink {
   const std::atomic<bool>& stop_;
 };
 
-// The access checks and follow-up steps of the database on screen.
-class ReceiveWindow::Hooks : public ReceiveHooks {
+// The follow-up steps of the database on screen. The access checks are
+// the shared ones, the same as the command line's receive makes.
+class ReceiveWindow::Hooks : public AccessCheckedReceiveHooks {
  public:
   Hooks(DataSession* session, const std::function<void()>& viewChanged)
       : session_(session), viewChanged_(viewChanged) {}
-  bool AllowAdd(Database& db, UiPort& ui) override { return Allowed(CheckAccess(db, secured::kAddRecords, ui)); }
-  bool AllowOpen(const std::string& path, UiPort& ui) override { return CheckOpenAccess(path, ui); }
   void AfterInsertActive(Database& db, size_t position) override {
     if (!session_ || &session_->db != &db) return;
     const size_t placed = RepositionRecord(db, position);
@@ -185,7 +185,7 @@ ReceiveWindow::ReceiveWindow(Settings& settings, std::string dataFolder, UiPort&
   auto* form = new QFormLayout;
   address_ = new QLineEdit(this);
   address_->setObjectName("receiveAddress");
-  address_->setText(QString::fromStdString(ReceiveAddressOrDefault(settings_.Get(obex::kReceiveAddressSetting))));
+  address_->setText(QString::fromStdString(ReceiveAddressOrDefault(settings_.Get(obex::kReceiveAddressSetting), obex::kDefaultReceiveAddress)));
   form->addRow("Listen on:", address_);
   state_ = new QLabel(this);
   state_->setObjectName("receiveState");

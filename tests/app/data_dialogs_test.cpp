@@ -76,9 +76,10 @@ TEST(BeamPeers, TypedPeersAreRememberedNewestFirstWithoutRepeats) {
 }
 
 TEST(ReceiveAddress, UnusableSettingsFallBackToAnUnprivilegedPort) {
-  EXPECT_EQ(ReceiveAddressOrDefault(std::nullopt), kDesktopReceiveAddress);
-  EXPECT_EQ(ReceiveAddressOrDefault(std::string("nonsense:port")), kDesktopReceiveAddress);
-  EXPECT_EQ(ReceiveAddressOrDefault(std::string(" 127.0.0.1:7000 ")), "127.0.0.1:7000");
+  const std::string fallback = "0.0.0.0:6500";
+  EXPECT_EQ(ReceiveAddressOrDefault(std::nullopt, fallback), fallback);
+  EXPECT_EQ(ReceiveAddressOrDefault(std::string("nonsense:port"), fallback), fallback);
+  EXPECT_EQ(ReceiveAddressOrDefault(std::string(" 127.0.0.1:7000 "), fallback), "127.0.0.1:7000");
   EXPECT_FALSE(CheckReceiveAddress("127.0.0.1:0"));
   EXPECT_TRUE(CheckReceiveAddress("127.0.0.1"));
   EXPECT_TRUE(CheckReceiveAddress("127.0.0.1:65536"));

@@ -2,6 +2,7 @@
 // process over loopback TCP, the device search cancelled, and records
 // received into an open database under its access rules.
 #include <QProgressDialog>
+#include <QLineEdit>
 #include <QPushButton>
 #include <QtTest>
 #include <atomic>
@@ -11,6 +12,7 @@
 #include "gui/data/beam.h"
 #include "gui/data/data_commands.h"
 #include "gui/data/receive_window.h"
+#include "infrared/beam_commands.h"
 #include "infrared/beam_payloads.h"
 #include "infrared/memory_transport.h"
 #include "infrared/obex_format.h"
@@ -192,6 +194,65 @@ class BeamTest : public QObject {
 
     window.StopListening();
     QVERIFY(!window.listening());
+  }
+
+  // Records for a database that is not open load it first: its Open
+  // Database level applies as it does everywhere else.
+  void receivedRecordsPassTheOpenDatabaseCheckAndTheDefaultPortIsUnprivileged() {
+    TempDir dir;
+    const std::string path = CopySample("Orders", dir.path());
+    ScriptedUi ui;
+    obex::BeamObject record;
+    {
+      Database db;
+      QVERIFY(db.Open(path, ui));
+      QVERIFY(obex::RecordObject(db, 0, record));
+      SecuritySettings s = LoadSecuritySettings(db.schema());
+      s.password = "pw";
+      s.levels[secured::kOpenDatabase] = access_level::kPassword;
+      ApplySecuritySettings(db, s);
+      QVERIFY(db.Save());
+    }
+    const QByteArray before = ReadAll(path);
+
+    MemorySettings settings;
+    gui::ReceiveWindow window(settings, dir.path(), ui, [] { return nullptr; }, [] {});
+    const QString shown = window.findChild<QLineEdit*>("receiveAddress")->text();
+    QCOMPARE(shown, QString(obex::kDefaultReceiveAddress));
+    QVERIFY(shown.section(':', -1).toInt() > 1023);
+
+    window.setAddress("127.0.0.1:0");
+    QVERIFY(window.StartListening());
+    QTRY_VERIFY_WITH_TIMEOUT(!window.listeningAddress().isEmpty(), 5000);
+    const std::string address = window.listeningAddress().toStdString();
+    auto send = [&] {
+      std::atomic<bool> done{false};
+      std::thread sender([&] {
+        SilentUi quiet;
+        TcpTransport transport({address});
+        obex::BeamWindows none;
+        obex::BeamObjects({record}, transport, quiet, none, obex::BeamOptions{});
+        done = true;
+      });
+      QTRY_VERIFY_WITH_TIMEOUT(done.load(), 20000);
+      sender.join();
+    };
+
+    ui.yesNoAnswers = {true, true, true};
+    send();  // the password prompt cancelled
+    QCOMPARE(ui.passwordPrompts, 1);
+    QCOMPARE(ReadAll(path), before);
+    QVERIFY(window.log().contains("Inserted 0 of 1"));
+
+    ui.yesNoAnswers = {true, true, true};
+    ui.passwordAnswers.push_back({"pw"});
+    send();
+    Database after;
+    QVERIFY(after.Open(path, ui));
+    Database original;
+    QVERIFY(original.OpenBytes(path, std::make_shared<const Bytes>(before.begin(), before.end()), ui));
+    QCOMPARE(after.recordCount(), original.recordCount() + 1);
+    window.StopListening();
   }
 };
 

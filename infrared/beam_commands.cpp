@@ -11,39 +11,14 @@ namespace {
 
 // Passes messages on and counts them: a transfer always runs to its end,
 // so the messages are what tells a beam that went wrong.
-class CountingUi : public UiPort {
+class CountingUi : public ForwardingUi {
  public:
-  explicit CountingUi(UiPort& inner) : inner_(inner) {}
+  explicit CountingUi(UiPort& inner) : ForwardingUi(inner) {}
   void ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) override {
     ++messages;
-    inner_.ShowMessage(text, caption, icon);
-  }
-  bool AskYesNo(const std::string& text, const std::string& caption) override {
-    return inner_.AskYesNo(text, caption);
-  }
-  Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
-    return inner_.AskYesNoCancel(text, caption);
-  }
-  std::optional<std::string> PromptPassword(int attempt) override {
-    return inner_.PromptPassword(attempt);
-  }
-  std::optional<std::string> AskOpenFile(const std::string& t, const std::string& f) override {
-    return inner_.AskOpenFile(t, f);
-  }
-  std::optional<std::string> AskSaveFile(const std::string& t, const std::string& f,
-                                         const std::string& s) override {
-    return inner_.AskSaveFile(t, f, s);
-  }
-  std::optional<std::string> ChooseOpenFile(const FileDialogRequest& r) override {
-    return inner_.ChooseOpenFile(r);
-  }
-  std::optional<std::string> ChooseSaveFile(const FileDialogRequest& r) override {
-    return inner_.ChooseSaveFile(r);
+    ForwardingUi::ShowMessage(text, caption, icon);
   }
   std::atomic<int> messages{0};
-
- private:
-  UiPort& inner_;
 };
 
 }  // namespace

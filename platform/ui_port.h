@@ -95,6 +95,49 @@ class SilentUi : public UiPort {
   }
 };
 
+// Passes every call on to another port. Ports that change one thing (count
+// messages, add a line to questions, show progress) derive from this and
+// override only that.
+class ForwardingUi : public UiPort {
+ public:
+  explicit ForwardingUi(UiPort& inner) : inner_(inner) {}
+  void ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) override {
+    inner_.ShowMessage(text, caption, icon);
+  }
+  bool AskYesNo(const std::string& text, const std::string& caption) override {
+    return inner_.AskYesNo(text, caption);
+  }
+  Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
+    return inner_.AskYesNoCancel(text, caption);
+  }
+  std::optional<std::string> PromptPassword(int attempt) override {
+    return inner_.PromptPassword(attempt);
+  }
+  std::optional<std::string> AskOpenFile(const std::string& title,
+                                         const std::string& filter) override {
+    return inner_.AskOpenFile(title, filter);
+  }
+  std::optional<std::string> AskSaveFile(const std::string& title, const std::string& filter,
+                                         const std::string& suggested) override {
+    return inner_.AskSaveFile(title, filter, suggested);
+  }
+  std::optional<std::string> ChooseOpenFile(const FileDialogRequest& request) override {
+    return inner_.ChooseOpenFile(request);
+  }
+  std::optional<std::string> ChooseSaveFile(const FileDialogRequest& request) override {
+    return inner_.ChooseSaveFile(request);
+  }
+  void SetBusy(bool busy) override { inner_.SetBusy(busy); }
+  void Status(const std::string& text) override { inner_.Status(text); }
+  bool WantsStatus() const override { return inner_.WantsStatus(); }
+
+ protected:
+  UiPort& inner() { return inner_; }
+
+ private:
+  UiPort& inner_;
+};
+
 // Sets the wait cursor for the lifetime of the object.
 class BusyScope {
  public:

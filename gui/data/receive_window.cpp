@@ -73,27 +73,15 @@ class ReceiveWindow::PeerNaming : public StreamTransport {
 
 // The program's port, with each question saying which computer sent what
 // it asks about.
-class FromPeerUi : public UiPort {
+class FromPeerUi : public ForwardingUi {
  public:
-  FromPeerUi(UiPort& inner, std::string peer) : inner_(inner), peer_(std::move(peer)) {}
-  void ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) override {
-    inner_.ShowMessage(text, caption, icon);
-  }
+  FromPeerUi(UiPort& inner, std::string peer) : ForwardingUi(inner), peer_(std::move(peer)) {}
   bool AskYesNo(const std::string& text, const std::string& caption) override {
-    return inner_.AskYesNo(From() + text, caption);
+    return ForwardingUi::AskYesNo(From() + text, caption);
   }
   Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
-    return inner_.AskYesNoCancel(From() + text, caption);
+    return ForwardingUi::AskYesNoCancel(From() + text, caption);
   }
-  std::optional<std::string> PromptPassword(int attempt) override { return inner_.PromptPassword(attempt); }
-  std::optional<std::string> AskOpenFile(const std::string& title, const std::string& filter) override {
-    return inner_.AskOpenFile(title, filter);
-  }
-  std::optional<std::string> AskSaveFile(const std::string& title, const std::string& filter,
-                                         const std::string& suggested) override {
-    return inner_.AskSaveFile(title, filter, suggested);
-  }
-  void SetBusy(bool busy) override { inner_.SetBusy(busy); }
 
  private:
   std::string From() const {
@@ -103,7 +91,6 @@ class FromPeerUi : public UiPort {
     if (!ParseHostPort(peer_, 0, host, port)) host = peer_;
     return "From " + host + ":\n";
   }
-  UiPort& inner_;
   std::string peer_;
 };
 

@@ -47,7 +47,7 @@ void ConnectHelp(QDialog* dialog, QDialogButtonBox* buttons, const QString& anch
 
 BusyFeedbackPort::BusyFeedbackPort(UiPort& inner, QWidget* parent, size_t records,
                                    size_t progressFrom)
-    : inner_(inner), parent_(parent), records_(records), progressFrom_(progressFrom) {}
+    : ForwardingUi(inner), parent_(parent), records_(records), progressFrom_(progressFrom) {}
 
 BusyFeedbackPort::~BusyFeedbackPort() {
   if (busy_) SetBusy(false);
@@ -56,7 +56,7 @@ BusyFeedbackPort::~BusyFeedbackPort() {
 void BusyFeedbackPort::SetBusy(bool busy) {
   if (busy == busy_) return;
   busy_ = busy;
-  inner_.SetBusy(busy);
+  ForwardingUi::SetBusy(busy);
   if (busy) {
     QApplication::setOverrideCursor(Qt::WaitCursor);
     if (records_ >= progressFrom_) {

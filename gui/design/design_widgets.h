@@ -32,46 +32,17 @@ void ConnectHelp(QDialog* dialog, QDialogButtonBox* buttons, const QString& anch
 // Wraps the port a long design operation talks to: questions pass through
 // as they are, and while the operation is busy the wait cursor shows and,
 // for a database of at least `progressFrom` records, a progress window too.
-class BusyFeedbackPort : public UiPort {
+class BusyFeedbackPort : public ForwardingUi {
  public:
   BusyFeedbackPort(UiPort& inner, QWidget* parent, size_t records, size_t progressFrom = 5000);
   ~BusyFeedbackPort() override;
 
-  void ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) override {
-    inner_.ShowMessage(text, caption, icon);
-  }
-  bool AskYesNo(const std::string& text, const std::string& caption) override {
-    return inner_.AskYesNo(text, caption);
-  }
-  Answer AskYesNoCancel(const std::string& text, const std::string& caption) override {
-    return inner_.AskYesNoCancel(text, caption);
-  }
-  std::optional<std::string> PromptPassword(int attempt) override {
-    return inner_.PromptPassword(attempt);
-  }
-  std::optional<std::string> AskOpenFile(const std::string& title,
-                                         const std::string& filter) override {
-    return inner_.AskOpenFile(title, filter);
-  }
-  std::optional<std::string> AskSaveFile(const std::string& title, const std::string& filter,
-                                         const std::string& suggested) override {
-    return inner_.AskSaveFile(title, filter, suggested);
-  }
-  std::optional<std::string> ChooseOpenFile(const FileDialogRequest& request) override {
-    return inner_.ChooseOpenFile(request);
-  }
-  std::optional<std::string> ChooseSaveFile(const FileDialogRequest& request) override {
-    return inner_.ChooseSaveFile(request);
-  }
   void SetBusy(bool busy) override;
-  void Status(const std::string& text) override { inner_.Status(text); }
-  bool WantsStatus() const override { return inner_.WantsStatus(); }
 
   // True once the progress window was shown (for tests).
   bool showedProgress() const { return showedProgress_; }
 
  private:
-  UiPort& inner_;
   QWidget* parent_;
   size_t records_;
   size_t progressFrom_;

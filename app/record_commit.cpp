@@ -1,6 +1,9 @@
 #include "app/record_commit.h"
 
 #include <algorithm>
+#include <string>
+#include <utility>
+#include <vector>
 
 #include "design/security.h"
 #include "ops/calc.h"
@@ -117,6 +120,34 @@ StoreOutcome StoreRecord(DataSession& session, size_t index, Bytes stored,
   out.ok = out.stored = true;
   out.index = index;
   return out;
+}
+
+bool AppendTypedToPopups(RecordForm& form) {
+  Database& db = form.session().db;
+  const Schema& schema = db.schema();
+  std::vector<std::pair<int, std::string>> wanted;
+  for (int f = 0; f < format::kFieldCount; ++f) {
+    const FieldDef& def = schema.field[f];
+    const FieldType type = def.type();
+    if (!def.popupsAppend || !form.Modified(f)) continue;
+    if (type != FieldType::Text && type != FieldType::Note && type != FieldType::Integer &&
+        type != FieldType::Float) {
+      continue;
+    }
+    std::string text = form.Text(f);
+    if (text.empty()) continue;
+    if (text.size() > format::kMaxPopupText) text.resize(format::kMaxPopupText);
+    const auto& items = db.popups()[f].items;
+    if (std::find(items.begin(), items.end(), text) != items.end()) continue;
+    if (items.size() >= static_cast<size_t>(format::kMaxPopupItems)) continue;
+    wanted.emplace_back(f, std::move(text));
+  }
+  if (wanted.empty()) return false;
+  // The record is saved either way; only the lists wait for the check.
+  if (!Allowed(CheckAccess(db, secured::kEditPopups, form.session().ui))) return false;
+  for (auto& [field, text] : wanted) db.popups()[field].items.push_back(std::move(text));
+  db.MarkChanged();
+  return true;
 }
 
 StoreOutcome CommitForm(RecordForm& form, RecordHistory* history) {

@@ -42,6 +42,12 @@ StoreOutcome StoreRecord(DataSession& session, size_t index, Bytes stored,
 // the database not marked).
 StoreOutcome CommitForm(RecordForm& form, RecordHistory* history);
 
+// Texts typed into Text, Note, Integer and Float fields whose "Popups
+// Append" is on, and which their popup lists lack: added to those lists
+// (while a list has room) after one "Edit Popups" check. True when a list
+// changed. Runs before the form is committed, on the values as typed.
+bool AppendTypedToPopups(RecordForm& form);
+
 // The common frame of an in-place edit: the record is read into a form,
 // `change` edits it, and it is written back where it stands. 0, or -1 when
 // there is no such record; a change that leaves the value as it was

@@ -188,6 +188,7 @@ void EditorCommands::RunEditor(size_t record, bool viewOnly, std::optional<size_
   Document* doc = workspace_.shown();
   if (!doc) return;
   RecordEditorDialog dialog(*doc, record, viewOnly, HistoryOf(doc), window_, copyFrom);
+  dialog.SetSettings(settings_);
   dialog.exec();
   UpdateActions();
   if (dialog.exitKind() == RecordEditorDialog::Exit::FollowLink) {

@@ -13,6 +13,7 @@
 #include "app/document.h"
 #include "app/pickers.h"
 #include "app/record_history.h"
+#include "platform/settings.h"
 
 class QAction;
 class QWidget;
@@ -44,6 +45,9 @@ class EditorCommands : public QObject, private WorkspaceListener {
   QAction* redoAction() const { return redo_; }
 
   RecordHistory* HistoryOf(Document* doc);
+  // The settings store the editor's beam and print commands read (the
+  // session's); null: the user's own.
+  void SetSettings(Settings* settings) { settings_ = settings; }
   InPlacePreferences preferences() const;
 
  private:
@@ -71,6 +75,7 @@ class EditorCommands : public QObject, private WorkspaceListener {
 
   QWidget* window_;
   Workspace& workspace_;
+  Settings* settings_ = nullptr;
   RecordHistories histories_;
   std::vector<Pending> pending_;
   QAction* undo_ = nullptr;

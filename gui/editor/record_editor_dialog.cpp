@@ -25,6 +25,7 @@
 #include "gui/common/help.h"
 #include "gui/common/qt_ui_port.h"
 #include "gui/common/text.h"
+#include "gui/design/design_commands.h"
 #include "gui/data/data_commands.h"
 #include "gui/editor/image_editor_dialog.h"
 #include "gui/editor/picker_dialogs.h"
@@ -399,8 +400,13 @@ QWidget* RecordEditorDialog::MakeNumberBox(int field) {
 QWidget* RecordEditorDialog::MakePopupBox(int field) {
   auto* combo = new QComboBox(rows_);
   const Database& db = doc_.db();
-  for (const PopupMenuEntry& e : PopupMenuEntries(db, field, true, false)) {
+  for (const PopupMenuEntry& e : PopupMenuEntries(db, field, true, !viewOnly_)) {
     const int index = PopupResultForEntry(db, field, {e}, e.id);
+    if (index == kPopupEditList) {
+      combo->insertSeparator(combo->count());
+      combo->addItem(FromDb(e.text) + "...", kPopupEditList);
+      continue;
+    }
     combo->addItem(FromDb(e.text), index == kPopupNoValue ? 255 : index);
   }
   const uint8_t stored = form_->Byte(field);
@@ -414,6 +420,12 @@ QWidget* RecordEditorDialog::MakePopupBox(int field) {
   combo->setCurrentIndex(at);
   combo->setEnabled(!viewOnly_);
   connect(combo, &QComboBox::activated, this, [this, combo, field](int i) {
+    if (combo->itemData(i).toInt() == kPopupEditList) {
+      combo->setCurrentIndex(combo->findData(static_cast<int>(form_->Byte(field))));
+      // Queued: the combo must not be rebuilt under its own signal.
+      QMetaObject::invokeMethod(this, [this, field] { EditPopups(field); }, Qt::QueuedConnection);
+      return;
+    }
     form_->SetByte(field, static_cast<uint8_t>(combo->itemData(i).toInt()));
   });
   return combo;
@@ -536,8 +548,18 @@ bool RecordEditorDialog::eventFilter(QObject* watched, QEvent* event) {
   return QDialog::eventFilter(watched, event);
 }
 
+void RecordEditorDialog::EditPopups(int field) {
+  // A Delete in the list renumbers stored records: what was typed is stored
+  // first (as following a link does), and the form reloads afterwards.
+  if (viewOnly_ || !Apply()) return;
+  if (!EditPopupList(this, doc_, field)) return;
+  doc_.ViewChangedExternally(false);
+  Load(form_->index(), std::nullopt);
+}
+
 bool RecordEditorDialog::Apply() {
   if (viewOnly_) return false;
+  AppendTypedToPopups(*form_);
   StoreOutcome out = CommitForm(*form_, history_);
   if (!out.ok) return false;
   doc_.SetCurrentRecord(out.index);
@@ -622,8 +644,8 @@ void RecordEditorDialog::BeamRecord() {
   if (!viewOnly_ && !Apply()) return;
   DataTarget target = TargetFor(doc_);
   target.current = form_->index();
-  std::unique_ptr<Settings> settings = OpenDesktopSettings();
-  BeamCommand(this, target, *settings, obex::BeamWhat::kRecord);
+  std::unique_ptr<Settings> own = settings_ ? nullptr : OpenDesktopSettings();
+  BeamCommand(this, target, settings_ ? *settings_ : *own, obex::BeamWhat::kRecord);
 }
 
 void RecordEditorDialog::DeleteRecord() {

@@ -15,6 +15,7 @@
 #include "app/record_commit.h"
 #include "app/record_form.h"
 #include "app/record_history.h"
+#include "platform/settings.h"
 
 class QAction;
 class QGridLayout;
@@ -43,7 +44,13 @@ class RecordEditorDialog : public QDialog {
                      QWidget* parent = nullptr, std::optional<size_t> copyFrom = std::nullopt);
   ~RecordEditorDialog() override;
 
+  // The settings store "Beam Record..." reads; null: the user's own.
+  void SetSettings(Settings* settings) { settings_ = settings; }
+
   Exit exitKind() const { return exit_; }
+  // "Edit Popup List" from a Pop-Up field's list (the "Edit Popups" check
+  // runs first).
+  void EditPopups(int field);
   // The field whose button was pressed (FollowLink).
   int linkField() const { return linkField_; }
   // The record the editor stands on (after saving: where it went).
@@ -96,6 +103,7 @@ class RecordEditorDialog : public QDialog {
 
   Document& doc_;
   RecordHistory* history_;
+  Settings* settings_ = nullptr;
   bool viewOnly_;
   std::unique_ptr<RecordForm> form_;
   Exit exit_ = Exit::Cancelled;

@@ -604,6 +604,12 @@ void MainWindow::copyRecordsTo() {
 void MainWindow::printRecords() {
   if (Document* doc = document()) PrintCommand(this, TargetFor(*doc), /*all=*/true);
 }
+void MainWindow::SetSettings(Settings* settings) {
+  settings_ = settings;
+  // The editor's "Beam Record..." reads the same store as the menus here.
+  EditorCommandsOf(this, workspace_).SetSettings(settings);
+}
+
 void MainWindow::beamRecords() {
   if (Document* doc = document()) BeamForWindow(this, *doc, settings_, obex::BeamWhat::kRecordsInView);
 }

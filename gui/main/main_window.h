@@ -43,7 +43,7 @@ class MainWindow : public QMainWindow, private WorkspaceListener, private Docume
   // The program's settings store (the preferences' own, so that tests and
   // screenshots never touch the user's); null until the session sets it.
   Settings* settings() const { return settings_; }
-  void SetSettings(Settings* settings) { settings_ = settings; }
+  void SetSettings(Settings* settings);
   // The document of the shown level; null when nothing is open.
   Document* document() { return workspace_.shown(); }
   // Reads rows and columns again and selects the current record.

@@ -226,6 +226,44 @@ TEST(RecordHistory, AStepWhoseRecordIsGoneIsDroppedNotMisapplied) {
   EXPECT_FALSE(history.CanRedo());
 }
 
+TEST(PopupsAppend, TypedTextsJoinTheListAfterTheEditPopupsCheck) {
+  Ledger t;
+  t.db.schema().field[t.name].popupsAppend = 1;
+  t.db.popups()[t.name].items = {"b"};
+  t.db.schema().password.set("pw");
+  SecuritySettings s = LoadSecuritySettings(t.db.schema());
+  s.levels[secured::kEditPopups] = access_level::kPassword;
+  ApplySecuritySettings(t.db, s);
+  t.db.ClearChanged();
+
+  auto typed = [&](const std::string& name, const std::string& amount) {
+    RecordForm form(t.session, kNewRecordIndex, kClock);
+    form.SetText(t.name, name);
+    form.SetText(t.amount, amount);
+    return AppendTypedToPopups(form);
+  };
+  // A refused check keeps the list; an entry already there asks nothing;
+  // a field without the option adds nothing.
+  EXPECT_FALSE(typed("c", "7"));
+  EXPECT_EQ(t.ui.passwordPrompts, 1);
+  EXPECT_FALSE(typed("b", "7"));
+  EXPECT_EQ(t.ui.passwordPrompts, 1);
+  EXPECT_EQ(t.db.popups()[t.name].items, std::vector<std::string>{"b"});
+  EXPECT_TRUE(t.db.popups()[t.amount].items.empty());
+  EXPECT_FALSE(t.db.changed());
+
+  t.ui.passwordAnswers.push_back({"pw"});
+  EXPECT_TRUE(typed("c", "7"));
+  EXPECT_EQ(t.db.popups()[t.name].items, (std::vector<std::string>{"b", "c"}));
+  EXPECT_TRUE(t.db.changed());
+
+  // A full list takes no more.
+  t.db.popups()[t.name].items.resize(60, "x");
+  t.ui.passwordAnswers.push_back({"pw"});
+  EXPECT_FALSE(typed("z", "7"));
+  EXPECT_EQ(t.db.popups()[t.name].items.size(), 60u);
+}
+
 // Orders with a Link field to Items, whose Linked field holds the order's
 // number.
 class DeleteWithLinks : public ::testing::Test {

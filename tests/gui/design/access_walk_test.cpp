@@ -1,7 +1,10 @@
 // Every guarded command of the desktop program at every access level, with
 // no password, the right one in the wrong letter case, and the right one.
 #include <QComboBox>
+#include <QLineEdit>
+#include <QPlainTextEdit>
 #include <QPushButton>
+#include <QSignalSpy>
 #include <QtTest>
 #include <functional>
 
@@ -12,11 +15,15 @@
 #include "gui/design/design_commands.h"
 #include "gui/design/field_editor_dialog.h"
 #ifdef CARDOVEX_WALK_EDITOR
+#include "app/record_commit.h"
 #include "gui/editor/editor_commands.h"
+#include "gui/editor/record_editor_dialog.h"
 #endif
 #ifdef CARDOVEX_WALK_DATA
 #include "gui/data/data_commands.h"
+#include "gui/data/beam.h"
 #include "gui/data/data_util.h"
+#include "infrared/beam_commands.h"
 #endif
 #include "platform/settings.h"
 #include "tests/design/design_db.h"
@@ -56,6 +63,21 @@ bool ShowsDialog(const char* dialog, const std::function<void()>& command) {
   StopModalWatchers();
   return shown;
 }
+
+#ifdef CARDOVEX_WALK_DATA
+// A beam ran when its session started. The peer is a loopback port where
+// nothing listens, and the search is cancelled at once: no transfer.
+bool Beams(Workspace& ws, obex::BeamWhat what) {
+  MemorySettings settings;
+  settings.Set(obex::kBeamPeersSetting, "127.0.0.1:1");
+  BeamSession* session = BeamCommand(nullptr, DataTarget(ws.shown()->session()), settings, what);
+  if (!session) return false;
+  QSignalSpy done(session, &BeamSession::finished);
+  session->CancelSearch();
+  if (done.isEmpty()) done.wait(5000);
+  return true;
+}
+#endif
 
 const std::vector<Site>& Sites() {
   static const std::vector<Site> sites = {
@@ -105,6 +127,20 @@ const std::vector<Site>& Sites() {
          EditorCommands commands(&window, ws);
          return ShowsDialog("recordEditor", [&] { commands.OpenRecordAt(0, 1, QPoint()); });
        }},
+      {"editor's edit popup list", secured::kEditPopups,
+       [](Workspace& ws, const std::string&, const std::string&) {
+         Document& doc = *ws.shown();
+         RecordEditorDialog editor(doc, doc.recordAt(0), false, nullptr);
+         return ShowsDialog("popupListDialog", [&] { editor.EditPopups(0); });
+       }},
+      {"popups append", secured::kEditPopups,
+       [](Workspace& ws, const std::string&, const std::string&) {
+         Document& doc = *ws.shown();
+         doc.db().schema().field[1].popupsAppend = 1;
+         RecordForm form(doc.session(), doc.recordAt(0), doc.context().clock);
+         form.SetText(1, "typed");
+         return AppendTypedToPopups(form);
+       }},
 #endif
 #ifdef CARDOVEX_WALK_DATA
       {"copy records, target", secured::kAddRecords,
@@ -119,6 +155,12 @@ const std::vector<Site>& Sites() {
          return ws.shown()->db().recordCount() == 0;
        },
        false, 2},
+      {"beam records", secured::kBeamData,
+       [](Workspace& ws, const std::string&, const std::string&) { return Beams(ws, obex::BeamWhat::kRecordsInView); }},
+      {"beam database", secured::kBeamData,
+       [](Workspace& ws, const std::string&, const std::string&) { return Beams(ws, obex::BeamWhat::kDatabase); }},
+      {"beam record", secured::kBeamData,
+       [](Workspace& ws, const std::string&, const std::string&) { return Beams(ws, obex::BeamWhat::kRecord); }},
 #endif
   };
   return sites;
@@ -134,6 +176,40 @@ class AccessWalkTest : public QObject {
 
  private slots:
   void cleanup() { StopModalWatchers(); }
+
+#ifdef CARDOVEX_WALK_EDITOR
+  // "View Records Only" opens the record, but nothing in it can be changed.
+  void viewRecordsOnlyOpensTheFormReadOnly() {
+    const std::string path = dir_.File("viewonly.PDB");
+    Database db = MakeDatabase(path, {{"Colour", FieldType::PopUp}, {"Name", FieldType::Text}});
+    db.popups()[0].items = {"Red", "Blue"};
+    AddRecord(db, {"0", "first"});
+    SetLevel(db.schema(), secured::kEditRecords, access_level::kViewOnly);
+    QVERIFY(db.SaveAs(path).ok());
+    ScriptedUi ui;
+    LocaleInfo locale;
+    MemorySettings settings;
+    Preferences preferences(settings);
+    RecentFiles recent(settings);
+    AppContext context{ui, locale, preferences, recent, dir_.path()};
+    Workspace workspace(context);
+    QVERIFY(workspace.Open(path));
+    QWidget window;
+    EditorCommands commands(&window, workspace);
+    int editable = -1;
+    OnModal(QStringLiteral("recordEditor"), [&editable](QWidget* w) {
+      editable = 0;
+      for (auto* e : w->findChildren<QLineEdit*>()) editable += e->isVisible() && !e->isReadOnly();
+      for (auto* e : w->findChildren<QPlainTextEdit*>()) editable += !e->isReadOnly();
+      for (auto* c : w->findChildren<QComboBox*>()) editable += c->isEnabled();
+      qobject_cast<QDialog*>(w)->reject();
+    });
+    commands.OpenRecordAt(0, 1, QPoint());
+    StopModalWatchers();
+    QCOMPARE(editable, 0);
+    QCOMPARE(ui.passwordPrompts, 0);
+  }
+#endif
 
   void walk_data() {
     QTest::addColumn<int>("site");

@@ -24,6 +24,19 @@ foreach(line IN LISTS lines)
   list(APPEND fields --field "${line}")
 endforeach()
 run(new ${db} --force --name ${NAME} ${fields})
+# A new database gives every slot a column width, unused ones too; the
+# samples show only the fields they use.
+set(used 0)
+foreach(line IN LISTS lines)
+  if(NOT (line MATCHES "^#" OR line STREQUAL ""))
+    math(EXPR used "${used} + 1")
+  endif()
+endforeach()
+if(used LESS 30)
+  foreach(slot RANGE ${used} 29)
+    run(set-field ${db} ${slot} --pixels 0)
+  endforeach()
+endif()
 
 execute_process(COMMAND iconv -f UTF-8 -t WINDOWS-1252 ${SRC}/${NAME}.csv
                 OUTPUT_FILE ${OUT}/${NAME}.cp1252.csv RESULT_VARIABLE rc)

@@ -31,7 +31,7 @@ unset QT_QPA_PLATFORM
 cat > "$work/inner.sh" <<'INNER'
 #!/usr/bin/env bash
 set -u
-program=$1 file=$2 work=$3
+program=$1 file=$2 work=$3 how=$4
 QT_QPA_PLATFORM=xcb "$program" "$file" >"$work/program.log" 2>&1 &
 pid=$!
 window=""
@@ -53,15 +53,20 @@ echo "window $window: $(xdotool getwindowname "$window")"
 if command -v import >/dev/null 2>&1; then
   timeout 10 import -window root "$work/screen.png" 2>/dev/null || true
 fi
-# Without a window manager the focus must be given explicitly.
-xdotool windowfocus --sync "$window" 2>/dev/null || xdotool windowfocus "$window"
-xdotool key --clearmodifiers ctrl+q
+if [ "$how" = term ]; then
+  # As a logout (or `kill`) ends it.
+  kill -TERM "$pid"
+else
+  # Without a window manager the focus must be given explicitly.
+  xdotool windowfocus --sync "$window" 2>/dev/null || xdotool windowfocus "$window"
+  xdotool key --clearmodifiers ctrl+q
+fi
 for _ in $(seq 1 100); do
   kill -0 "$pid" 2>/dev/null || break
   sleep 0.1
 done
 if kill -0 "$pid" 2>/dev/null; then
-  echo "FAIL: the program did not end after Ctrl+Q"
+  echo "FAIL: the program did not end ($how)"
   kill "$pid" 2>/dev/null; sleep 0.5; kill -9 "$pid" 2>/dev/null
   wait "$pid" 2>/dev/null
   exit 1
@@ -73,15 +78,18 @@ exit 0
 INNER
 chmod +x "$work/inner.sh"
 
-timeout 120 xvfb-run -a -s "-screen 0 1024x768x24 -nolisten tcp" "$work/inner.sh" "$program" "$work/Contacts.PDB" "$work"
-code=$?
-[ "$code" -eq 0 ] || exit 1
-
-# The normal end wrote the file used last and the preferences.
+# Either way of ending goes through the normal end, which writes the file
+# used last and the preferences.
 conf=$XDG_CONFIG_HOME/Cardovex/Cardovex.conf
-if ! grep -q "LastFileUsed=.*Contacts.PDB" "$conf" 2>/dev/null || ! grep -q "AutoSave=1" "$conf"; then
-  echo "FAIL: the settings were not written at the end:"
-  cat "$conf" 2>/dev/null
-  exit 1
-fi
+for how in quit term; do
+  rm -f "$conf"
+  timeout 120 xvfb-run -a -s "-screen 0 1024x768x24 -nolisten tcp" "$work/inner.sh" "$program" "$work/Contacts.PDB" "$work" "$how"
+  code=$?
+  [ "$code" -eq 0 ] || exit 1
+  if ! grep -q "LastFileUsed=.*Contacts.PDB" "$conf" 2>/dev/null || ! grep -q "AutoSave=1" "$conf"; then
+    echo "FAIL: the settings were not written at the end ($how):"
+    cat "$conf" 2>/dev/null
+    exit 1
+  fi
+done
 echo "PASS"

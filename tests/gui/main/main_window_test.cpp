@@ -10,6 +10,7 @@
 #include <QMouseEvent>
 #include <QSignalSpy>
 #include <QCheckBox>
+#include <QComboBox>
 #include <QListWidget>
 #include <QMenu>
 #include <QTest>
@@ -18,6 +19,7 @@
 #include "app/columns.h"
 #include "gui/common/icons.h"
 #include "gui/common/text.h"
+#include "gui/editor/editor_commands.h"
 #include "gui/main/desktop_session.h"
 #include "gui/main/record_delegate.h"
 #include "gui/main/record_list_model.h"
@@ -94,6 +96,45 @@ class TestMainWindow : public QObject {
   }
 
  private slots:
+  // The beam commands offer the peers remembered in the session's own
+  // settings store, not in the user's real one.
+  void beamCommandsReadTheSessionsSettings() {
+    DesktopSession& s = Start({"Orders"});
+    s.settings().Set("RecentBeamPeers", "remembered.example:6500");
+    auto offered = [](QWidget* w) {
+      auto* box = w->findChild<QComboBox*>(QStringLiteral("beamPeer"));
+      return box ? box->itemText(0) : QStringLiteral("<no peer dialog: %1>").arg(w->objectName());
+    };
+    QString fromWindow, fromEditor;
+    {
+      ModalAnswer peers([&](QWidget* w) {
+        fromWindow = offered(w);
+        ModalAnswer::Reject()(w);
+      });
+      s.window().action(QStringLiteral("Beam Records..."))->trigger();
+      QVERIFY(peers.answered());
+    }
+    QCOMPARE(fromWindow, QStringLiteral("remembered.example:6500"));
+
+    ModalAnswer editor([&](QWidget* w) {
+      QAction* beam = nullptr;
+      for (QAction* a : w->findChildren<QAction*>()) {
+        if (a->text() == QStringLiteral("Beam Record...")) beam = a;
+      }
+      if (beam) {
+        ModalAnswer peers([&](QWidget* p) {
+          fromEditor = offered(p);
+          ModalAnswer::Reject()(p);
+        });
+        beam->trigger();
+      }
+      ModalAnswer::Reject()(w);
+    });
+    cx::gui::EditorCommandsOf(&s.window(), s.workspace()).OpenRecordAt(0, 1, QPoint());
+    QVERIFY(editor.answered());
+    QCOMPARE(fromEditor, QStringLiteral("remembered.example:6500"));
+  }
+
   void cleanup() {
     if (session_) {
       // Nothing the test left changed is saved or asked about.

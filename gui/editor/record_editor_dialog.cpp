@@ -551,7 +551,10 @@ bool RecordEditorDialog::eventFilter(QObject* watched, QEvent* event) {
 void RecordEditorDialog::EditPopups(int field) {
   // A Delete in the list renumbers stored records: what was typed is stored
   // first (as following a link does), and the form reloads afterwards.
-  if (viewOnly_ || !Apply()) return;
+  if (viewOnly_) return;
+  // An untouched new form is no record yet: nothing to store.
+  const bool blank = form_->isNew() && !form_->AnyModified();
+  if (!blank && !Apply()) return;
   if (!EditPopupList(this, doc_, field)) return;
   doc_.ViewChangedExternally(false);
   Load(form_->index(), std::nullopt);

@@ -154,6 +154,24 @@ TEST(ListingTest, ExportRecordsTextAsksForTheFileAndReports) {
   EXPECT_FALSE(ExportRecordsText(db, true, 0, ui, ctx));
   EXPECT_EQ(ui.messages.back().text, "ERROR: Unable to open file for writing.");
   EXPECT_EQ(ui.messages.back().caption, "Error");
+
+  // A database picked by mistake is replaced only when the user says so.
+  const std::string other = dir.File("Other.PDB");
+  ASSERT_TRUE(db.SaveAs(other).ok());
+  std::vector<uint8_t> before;
+  ASSERT_TRUE(ReadWholeFile(other, before));
+  ui.fileAnswers.push_back(other);
+  ui.yesNoAnswers = {false};
+  EXPECT_FALSE(ExportRecordsText(db, true, 0, ui, ctx));
+  ASSERT_EQ(ui.questions.size(), 1u);
+  EXPECT_NE(ui.questions[0].text.find(other), std::string::npos);
+  ASSERT_TRUE(ReadWholeFile(other, bytes));
+  EXPECT_EQ(bytes, before);
+  ui.fileAnswers.push_back(other);
+  ui.yesNoAnswers = {true};
+  EXPECT_TRUE(ExportRecordsText(db, true, 0, ui, ctx));
+  ASSERT_TRUE(ReadWholeFile(other, bytes));
+  EXPECT_EQ(std::string(bytes.begin(), bytes.end()), Listing(db, true, 0));
 }
 
 }  // namespace

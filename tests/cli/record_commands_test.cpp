@@ -1,8 +1,10 @@
 // One record at a time from the command line (add, edit, delete --record),
 // the read-only query of records, and how a command finds its database and
 // its password.
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cstdlib>
 #include <fstream>
@@ -37,6 +39,23 @@ Bytes FileBytes(const std::string& path) {
   EXPECT_TRUE(ReadWholeFile(path, b)) << path;
   return b;
 }
+
+// Questions and prompts find no terminal, even when the tests run from one.
+class NoTerminalInput {
+ public:
+  NoTerminalInput() : saved_(::dup(STDIN_FILENO)) {
+    const int null = ::open("/dev/null", O_RDONLY);
+    ::dup2(null, STDIN_FILENO);
+    ::close(null);
+  }
+  ~NoTerminalInput() {
+    ::dup2(saved_, STDIN_FILENO);
+    ::close(saved_);
+  }
+
+ private:
+  int saved_;
+};
 
 std::string Field(const std::string& name, const std::string& text) {
   return "\"name\":\"" + name + "\",\"text\":\"" + text + "\"";
@@ -148,6 +167,27 @@ TEST(CliRecordCommands, SortedDatabasePlacesAddedAndEditedRecords) {
   EXPECT_EQ(Cli({"delete", path, "--record", "2"}).code, 2);
 }
 
+TEST(CliRecordCommands, DeletingOneRecordAsksAboutLinkedRecords) {
+  testing::TempDir dir;
+  const std::string path = dir.File("Parents.PDB");
+  ASSERT_EQ(Cli({"new", path, "--name", "Parents", "--field", "Name:Text", "--field",
+                 "Kids:Link:db=Kids,other=1,show=0"}).code, 0);
+  ASSERT_EQ(Cli({"add", path, "Name=Ann"}).code, 0);
+  ASSERT_EQ(Cli({"add", path, "Name=Bob"}).code, 0);
+  const Bytes before = FileBytes(path);
+  {
+    NoTerminalInput noTerminal;
+    Result refused = Cli({"delete", path, "--record", "1"});
+    EXPECT_EQ(refused.code, 1);
+    EXPECT_NE(refused.err.find("Would you like to delete the linked records also?"), std::string::npos)
+        << refused.err;
+  }
+  EXPECT_EQ(FileBytes(path), before);
+  Result r = Cli({"--no", "delete", path, "--record", "1"});
+  EXPECT_EQ(r.code, 0) << r.err;
+  EXPECT_EQ(Cli({"records", path}).out.substr(0, 21), "Index\tName\tKids\n0\tAnn");
+}
+
 TEST(CliQuery, ShowsTheResultWithoutTouchingTheFile) {
   testing::TempDir dir;
   const std::string path = dir.File("Query.PDB");
@@ -199,6 +239,7 @@ TEST(CliPasswords, PasswordFileGivesTheFirstLine) {
   EXPECT_EQ(wrong.code, 1);
   EXPECT_NE(wrong.err.find("Invalid Password"), std::string::npos) << wrong.err;
   // No password and no terminal: refused with a word on how to give one.
+  NoTerminalInput noTerminal;
   Result none = Cli({"records", path});
   EXPECT_EQ(none.code, 1);
   EXPECT_NE(none.err.find("--password-file"), std::string::npos) << none.err;

@@ -1,7 +1,8 @@
 // The user-interface port of the command-line tool: messages go to stderr;
 // questions are answered by --yes / --no and refused without them; the
-// password prompt is answered by --password, once: a wrong one is refused
-// rather than asked again.
+// password prompt is answered by --password (or --password-file), once: a
+// wrong one is refused rather than asked again. Without either, a terminal
+// is asked, without echo.
 #pragma once
 
 #include <iosfwd>
@@ -40,6 +41,7 @@ class CliUi : public UiPort {
   std::optional<bool> answer_;
   std::string password_;
   bool passwordGiven_ = false;
+  std::optional<std::string> typed_;  // at the terminal, for later checks
   bool unanswered_ = false;
   int messages_ = 0;
 };

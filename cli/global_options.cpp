@@ -2,6 +2,9 @@
 
 #include <cerrno>
 #include <cstring>
+#include <fstream>
+#include <iostream>
+#include <optional>
 #include <ostream>
 #include <sstream>
 
@@ -29,7 +32,11 @@ constexpr const char* kGlobalHelp = R"(Global options (before or after the comma
   --decimal C            decimal separator (a value other than "." makes numbers
                          use ",")
                          Defaults for all of these come from the system locale.
-  --password TEXT        the password of a protected database
+  --password TEXT        the password of a protected database (other users of
+                         the machine can read it in the process list)
+  --password-file FILE   the password from the first line of FILE, or of
+                         standard input with -; without either, a terminal
+                         is asked for it without echo
   --yes, --no            the answer to every question the command asks; without
                          one, questions are asked on the terminal, or (with no
                          terminal) refused, and the command changes nothing
@@ -50,6 +57,25 @@ bool TakeValue(const std::vector<std::string>& args, size_t& i, std::string& val
   if (i + 1 >= args.size()) return false;
   value = args[++i];
   return true;
+}
+
+// The first line of a file (or of standard input for "-"), without its
+// line end; nothing when it cannot be read. An empty file is an empty
+// password, as an empty --password is.
+std::optional<std::string> ReadPasswordLine(const std::string& file) {
+  errno = 0;
+  std::string line;
+  if (file == "-") {
+    std::getline(std::cin, line);
+    if (std::cin.bad()) return std::nullopt;
+  } else {
+    std::ifstream in(file, std::ios::binary);
+    if (!in) return std::nullopt;
+    std::getline(in, line);
+    if (in.bad()) return std::nullopt;
+  }
+  if (!line.empty() && line.back() == '\r') line.pop_back();
+  return line;
 }
 
 }  // namespace
@@ -116,6 +142,22 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
       if (!need(password)) return kExitUsage;
       std::string stored, error;
       if (!ToStoredText(password, "--password", stored, error)) {
+        err << "cardovex-cli: " << error << "\n";
+        return kExitUsage;
+      }
+      password = std::move(stored);
+      passwordGiven = true;
+    } else if (name == "--password-file") {
+      std::string file;
+      if (!need(file)) return kExitUsage;
+      std::optional<std::string> line = ReadPasswordLine(file);
+      if (!line) {
+        err << "cardovex-cli: --password-file: cannot read " << (file == "-" ? "standard input" : file)
+            << (errno ? std::string(": ") + std::strerror(errno) : std::string()) << "\n";
+        return kExitFailed;
+      }
+      std::string stored, error;
+      if (!ToStoredText(*line, "the password in " + file, stored, error)) {
         err << "cardovex-cli: " << error << "\n";
         return kExitUsage;
       }

@@ -6,6 +6,7 @@
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
+#include "cli/query.h"
 #include "engine/value_text.h"
 #include "ops/database_settings.h"
 #include "ops/filter_dialog.h"
@@ -83,7 +84,7 @@ class FilterCommand : public Command {
         f.notChecked = args.has("--not" + k);
         if (!f.enabled) continue;
         std::string error;
-        if (!ReadCondition(ctx, db, *args.value("--filter" + k), f, error)) {
+        if (!ReadFilterCondition(ctx, db, *args.value("--filter" + k), f, error)) {
           return UsageError(ctx, *this, "--filter" + k + ": " + error);
         }
       }
@@ -99,26 +100,6 @@ class FilterCommand : public Command {
   }
 
  private:
-  // FIELD=VALUE; a field name may itself hold "=", so each "=" is tried
-  // until the text before it names a field.
-  static bool ReadCondition(const Context& ctx, const Database& db, const std::string& cond, FilterDialogFilter& f,
-                       std::string& error) {
-    for (size_t eq = cond.find('='); eq != std::string::npos; eq = cond.find('=', eq + 1)) {
-      const int field = ResolveField(db, cond.substr(0, eq));
-      if (field < 0) continue;
-      std::string value;
-      if (!ToStoredText(cond.substr(eq + 1), "the value of " + cond.substr(0, eq), value, error)) {
-        return false;
-      }
-      if (ReadFilterValueText(db, field, value, ctx.locale, f, error)) return true;
-      error = Cp1252ToUtf8(error);
-      return false;
-    }
-    error = cond.find('=') == std::string::npos ? "COND is FIELD=VALUE"
-                                                : "no field " + cond.substr(0, cond.find('='));
-    return false;
-  }
-
   // The values the filter's field type uses, as text.
   static std::string Describe(const Context& ctx, const Database& db, const FilterDialogFilter& f) {
     switch (FilterControlsFor(db.schema(), f.field)) {

@@ -108,7 +108,8 @@ TEST(CliRecords, TableHasHeaderAndOneLineValues) {
   std::getline(lines, header);
   std::getline(lines, row);
   EXPECT_FALSE(std::getline(lines, extra));
-  EXPECT_EQ(header.rfind("Text\tInt\tFloat\tPop", 0), 0u);
+  EXPECT_EQ(header.rfind("Index\tText\tInt\tFloat\tPop", 0), 0u);
+  EXPECT_EQ(row.rfind("0\tcafé\t-42", 0), 0u);
   EXPECT_NE(row.find("line 1  line 2"), std::string::npos);
 }
 

@@ -3,6 +3,7 @@
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
+#include "cli/text_files.h"
 #include "ops/report.h"
 
 namespace cx::cli {
@@ -13,22 +14,26 @@ class ReportCommand : public Command {
   std::string name() const override { return "report"; }
   std::string summary() const override { return "count, extremes, sum and average of a field"; }
   std::string help() const override {
-    return "Usage: cardovex-cli report FILE FIELD [-o OUT [--force]]\n"
+    return "Usage: cardovex-cli report FILE FIELD [-o OUT [--force]] [--encoding E]\n"
            "Prints the report of FIELD (a slot number 0-29 or a name) over the records\n"
            "in view, exactly as the Report Results dialog shows it: lines ending in\n"
            "CR LF, tabs as they are. Integer, Float, Check-Box, Time, Date and\n"
            "Calculated fields have reports.\n"
-           "  -o OUT   write the report to OUT instead (Windows-1252, followed by one\n"
-           "           LF), as the dialog's Export does; a FIFO or device is written\n"
-           "           into\n"
-           "  --force  write OUT even when it is a database or FILE itself\n";
+           "  -o OUT   write the report to OUT instead (followed by one LF), as the\n"
+           "           dialog's Export does; a FIFO or device is written into; '-'\n"
+           "           is standard output\n"
+           "  --force  write OUT even when it is a database or FILE itself\n" +
+           std::string(kEncodingHelp);
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"-o"}, {"--force"});
+    Args args(argv, {"-o", "--encoding"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
+    TextEncoding encoding;
+    if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
+    const std::string target = args.value("-o").value_or("-");
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE FIELD");
-    if (auto out = args.value("-o"); out && !TextTargetAllowed(ctx, args, *out, args.positional()[0])) {
+    if (target != "-" && !TextTargetAllowed(ctx, args, target, args.positional()[0])) {
       return kExitFailed;
     }
     Database db;
@@ -37,11 +42,12 @@ class ReportCommand : public Command {
     if (slot < 0) return UsageError(ctx, *this, "no field " + args.positional()[1]);
     std::optional<std::string> text = RunReport(db, slot, ctx.locale, ctx.ui);
     if (!text) return kExitFailed;
-    if (auto out = args.value("-o")) {
-      if (Status s = ExportReportText(*text, *out); !s) return Failure(ctx, s.message());
-      return kExitOk;
-    }
-    Utf8StreamSink(ctx.out).Write(*text);
+    // The file gets the dialog's Export bytes, the terminal the text alone.
+    Status written = WriteTextTo(ctx, target, encoding, [&](TextSink& sink) {
+      sink.Write(*text);
+      if (target != "-") sink.Write("\n");
+    });
+    if (!written) return Failure(ctx, written.message());
     return kExitOk;
   }
 };

@@ -1,0 +1,72 @@
+#include "cli/text_files.h"
+
+#include <cstdio>
+#include <iostream>
+#include <iterator>
+#include <ostream>
+#include <vector>
+
+#include "platform/file_io.h"
+
+namespace cx::cli {
+namespace {
+
+class StreamSink : public TextSink {
+ public:
+  explicit StreamSink(std::ostream& out) : out_(out) {}
+  bool Write(std::string_view bytes) override {
+    out_.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+    return out_.good();
+  }
+
+ private:
+  std::ostream& out_;
+};
+
+}  // namespace
+
+bool EncodingOption(Context& ctx, const Command& command, const Args& args, TextEncoding& encoding,
+                    int& code) {
+  encoding = TextEncoding::kUtf8;
+  std::optional<std::string> name = args.value("--encoding");
+  if (!name) return true;
+  if (std::optional<TextEncoding> e = ParseTextEncoding(*name)) {
+    encoding = *e;
+    return true;
+  }
+  code = UsageError(ctx, command, "unknown encoding " + *name + " (utf-8 or windows-1252)");
+  return false;
+}
+
+Status WriteTextTo(Context& ctx, const std::string& path, TextEncoding encoding,
+                   const std::function<void(TextSink&)>& produce) {
+  if (path == "-") {
+    StreamSink stream(ctx.out);
+    EncodingSink out(stream, encoding);
+    produce(out);
+    ctx.out.flush();
+    if (!ctx.out.good()) return Status::Error("Cannot write to standard output");
+    return Status::Ok();
+  }
+  FileSink file(path);
+  if (Status s = file.Open(); !s) return s;
+  EncodingSink out(file, encoding);
+  produce(out);
+  return file.Commit();
+}
+
+Status ReadTextFrom(const std::string& path, std::string& bytes) {
+  if (path == "-") {
+    bytes.assign(std::istreambuf_iterator<char>(std::cin), std::istreambuf_iterator<char>());
+    if (std::cin.bad()) return Status::Error("Cannot read standard input");
+    return Status::Ok();
+  }
+  std::vector<uint8_t> raw;
+  if (!ReadWholeFile(path, raw)) return Status::Error("Cannot read " + path);
+  bytes.assign(raw.begin(), raw.end());
+  return Status::Ok();
+}
+
+std::string TextFileName(const std::string& path) { return path == "-" ? "standard input" : path; }
+
+}  // namespace cx::cli

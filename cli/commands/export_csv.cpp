@@ -3,6 +3,7 @@
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "cli/text_files.h"
 #include "ops/csv_export.h"
 
@@ -32,6 +33,7 @@ class ExportCsvCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--encoding"}, {"--quote-all", "--header", "--filtered", "--slot-order", "--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     TextEncoding encoding;

@@ -5,6 +5,7 @@
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "cli/text_files.h"
 #include "ops/csv_import.h"
 #include "platform/text_codec.h"
@@ -69,6 +70,11 @@ class ImportCsvCommand : public Command {
     if (!result.issues.empty()) ReportIssues(ctx, db, result.issues);
     if (!result.status) return Failure(ctx, result.status.message());
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json) {
+      PrintCounts(ctx, {{"imported", static_cast<int64_t>(result.imported)},
+                        {"linesNotStoredAsGiven", static_cast<int64_t>(result.issues.lines)}});
+      return kExitOk;
+    }
     ctx.out << result.imported << (result.imported == 1 ? " record" : " records") << " imported\n";
     return kExitOk;
   }

@@ -3,6 +3,7 @@
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "cli/text_files.h"
 #include "design/link_access.h"
 #include "ops/linked_listing.h"
@@ -29,6 +30,7 @@ class ListingCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--record", "-o", "--encoding"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     TextEncoding encoding;

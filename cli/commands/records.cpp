@@ -22,7 +22,9 @@ class RecordsCommand : public Command {
            "with the date, time and decimal conventions of the global options.\n"
            "  --all    every record, whatever the filters say\n"
            "With --json: an array of {\"index\": N, \"fields\": [{\"slot\", \"name\",\n"
-           "\"text\"}]}, line breaks kept. Without: a tab-separated table with a\n"
+           "\"text\", \"value\"}]}, line breaks kept; \"value\" is typed and the same\n"
+           "under any conventions (numbers, true/false, \"YYYY-MM-DD\", \"HH:MM:SS\",\n"
+           "null for no value). Without: a tab-separated table with a\n"
            "header row, line breaks shown as blanks.\n";
   }
 

@@ -11,19 +11,6 @@
 namespace cx::cli {
 namespace {
 
-std::string IsoDate(uint32_t dayNumber) {
-  CalendarDate d = DayNumberToDate(dayNumber);
-  char buf[16];
-  std::snprintf(buf, sizeof buf, "%04d-%02d-%02d", d.year, d.month, d.day);
-  return buf;
-}
-
-std::string ClockText(long hours, long minutes, long seconds) {
-  char buf[32];
-  std::snprintf(buf, sizeof buf, "%02ld:%02ld:%02ld", hours, minutes, seconds);
-  return buf;
-}
-
 // Float fields and calculated results keep the text that was typed or
 // computed, with the decimal separator of the settings in force then.
 void NumberFromText(JsonWriter& json, std::string text) {
@@ -56,6 +43,19 @@ void TextOrNull(JsonWriter& json, const std::string& text) {
 }
 
 }  // namespace
+
+std::string IsoDateText(uint32_t dayNumber) {
+  CalendarDate d = DayNumberToDate(dayNumber);
+  char buf[16];
+  std::snprintf(buf, sizeof buf, "%04d-%02d-%02d", d.year, d.month, d.day);
+  return buf;
+}
+
+std::string ClockText(long hours, long minutes, long seconds) {
+  char buf[32];
+  std::snprintf(buf, sizeof buf, "%02ld:%02ld:%02ld", hours, minutes, seconds);
+  return buf;
+}
 
 void WriteTypedValue(JsonWriter& json, const Schema& schema, const PopupLists& popups,
                      ByteView record, int slot) {
@@ -103,7 +103,7 @@ void WriteTypedValue(JsonWriter& json, const Schema& schema, const PopupLists& p
       if (day == 0) {
         json.Null();
       } else {
-        json.String(IsoDate(day));
+        json.String(IsoDateText(day));
       }
       return;
     }
@@ -134,7 +134,7 @@ void WriteTypedValue(JsonWriter& json, const Schema& schema, const PopupLists& p
           if (day <= 0) {
             json.Null();
           } else {
-            json.String(IsoDate(static_cast<uint32_t>(day)));
+            json.String(IsoDateText(static_cast<uint32_t>(day)));
           }
           return;
         }

@@ -134,6 +134,19 @@ def main(cli, samples):
             problems.append("typed values change with the regional settings")
         if values.get("text M/d/yyyy") == values.get("text dd.MM.yyyy"):
             problems.append("texts should follow the regional settings")
+        # So are the limits of a filter, however they were typed.
+        code, _, err = run(cli, EUROPE + ["filter", paths["O"], "--filter1", "Ordered=01.01.2024..31.01.2024",
+                                          "--filter2", "Price=1.5..20"])
+        if code != 0:
+            problems.append(f"filter: {err}")
+        limits = []
+        for conventions in (US, EUROPE):
+            shown = json.loads(run(cli, conventions + ["--json", "filter", paths["O"]])[1])
+            limits.append([(f.get("low"), f.get("high")) for f in shown["filters"]])
+        if limits[0] != limits[1] or limits[0] != [("2024-01-01", "2024-01-31"), (1.5, 20)]:
+            problems.append(f"filter limits {limits}")
+        run(cli, ["filter", paths["O"], "--off"])
+
         first = dict(zip((f["name"] for f in json.loads(run(cli, US + ["--json", "records", paths["O"], "--all"])[1])[0]["fields"]),
                          values.get("M/d/yyyy", [[]])[0]))
         expected = {"Order#": 1, "Item": "Espresso beans 1 kg", "Quantity": 2, "Price": 18.5,

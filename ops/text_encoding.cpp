@@ -1,5 +1,6 @@
 #include "ops/text_encoding.h"
 
+#include <array>
 #include <cctype>
 #include <cstdio>
 
@@ -79,7 +80,25 @@ std::vector<std::string> DescribeUnstorable(const NarrowedText& text) {
 
 bool EncodingSink::Write(std::string_view bytes) {
   if (encoding_ == TextEncoding::kWindows1252) return target_.Write(bytes);
-  wide_ = Cp1252ToUtf8(bytes);
+  // Exports write many short pieces, mostly ASCII: those pass unchanged,
+  // and the others reuse one buffer rather than allocating each time.
+  static const std::array<std::string, 128> kHigh = [] {
+    std::array<std::string, 128> high;
+    for (int b = 0; b < 128; ++b) high[b] = Cp1252ToUtf8(std::string(1, static_cast<char>(b + 128)));
+    return high;
+  }();
+  size_t i = 0;
+  while (i < bytes.size() && static_cast<unsigned char>(bytes[i]) < 0x80) ++i;
+  if (i == bytes.size()) return target_.Write(bytes);
+  wide_.assign(bytes.substr(0, i));
+  for (; i < bytes.size(); ++i) {
+    const unsigned char c = static_cast<unsigned char>(bytes[i]);
+    if (c < 0x80) {
+      wide_.push_back(static_cast<char>(c));
+    } else {
+      wide_ += kHigh[c - 128];
+    }
+  }
   return target_.Write(wide_);
 }
 

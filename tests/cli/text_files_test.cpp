@@ -212,6 +212,16 @@ TEST(NarrowText, KeepsWhatFitsAndCountsLinesAtLineFeeds) {
   EXPECT_EQ(t.first[0].character, "\\xC3");
   EXPECT_EQ(t.first[1].character, "\xF0\x9F\x98\x80");
   EXPECT_EQ(NarrowText("\xEF\xBB\xBFx", TextEncoding::kWindows1252).bytes, "\xEF\xBB\xBFx");
+
+  // Every byte widens as the code page says, in pieces of any size, and
+  // narrows back.
+  std::string all;
+  for (int b = 1; b < 256; ++b) all.push_back(static_cast<char>(b));
+  StringSink wide;
+  EncodingSink sink(wide, TextEncoding::kUtf8);
+  for (size_t at = 0; at < all.size(); at += 7) sink.Write(std::string_view(all).substr(at, 7));
+  EXPECT_EQ(wide.text, Cp1252ToUtf8(all));
+  EXPECT_EQ(NarrowText(wide.text, TextEncoding::kUtf8).bytes, all);
 }
 
 }  // namespace

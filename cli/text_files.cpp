@@ -1,12 +1,9 @@
 #include "cli/text_files.h"
 
-#include <cstdio>
+#include <fstream>
 #include <iostream>
-#include <iterator>
 #include <ostream>
-#include <vector>
-
-#include "platform/file_io.h"
+#include <sstream>
 
 namespace cx::cli {
 namespace {
@@ -57,13 +54,24 @@ Status WriteTextTo(Context& ctx, const std::string& path, TextEncoding encoding,
 
 Status ReadTextFrom(const std::string& path, std::string& bytes) {
   if (path == "-") {
-    bytes.assign(std::istreambuf_iterator<char>(std::cin), std::istreambuf_iterator<char>());
+    std::ostringstream all;
+    all << std::cin.rdbuf();
     if (std::cin.bad()) return Status::Error("Cannot read standard input");
+    bytes = std::move(all).str();
     return Status::Ok();
   }
-  std::vector<uint8_t> raw;
-  if (!ReadWholeFile(path, raw)) return Status::Error("Cannot read " + path);
-  bytes.assign(raw.begin(), raw.end());
+  // Read as a stream, so that a pipe named as the file (<(command)) works.
+  std::ifstream in(path, std::ios::binary);
+  if (!in) return Status::Error("Cannot read " + path);
+  bytes.clear();
+  char buffer[1 << 16];
+  // read() reports a failing file (a folder, say) in its state instead of
+  // throwing as the buffer's iterators do.
+  while (in.read(buffer, sizeof buffer) || in.gcount() > 0) {
+    bytes.append(buffer, static_cast<size_t>(in.gcount()));
+    if (!in) break;
+  }
+  if (in.bad()) return Status::Error("Cannot read " + path);
   return Status::Ok();
 }
 

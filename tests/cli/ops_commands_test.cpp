@@ -204,7 +204,7 @@ TEST(CliFilter, ShowingAndBadSpecsLeaveTheFile) {
   Result shown = Cli({"--json", "filter", path});
   ASSERT_EQ(shown.code, 0) << shown.err;
   EXPECT_EQ(shown.out,
-            "{\"filters\":[{\"enabled\":true,\"not\":false,\"slot\":1,\"name\":\"Qty\",\"test\":\"6 to 12\"},"
+            "{\"filters\":[{\"enabled\":true,\"not\":false,\"slot\":1,\"name\":\"Qty\",\"test\":\"6 to 12\",\"low\":6,\"high\":12},"
             "{\"enabled\":true,\"not\":true,\"slot\":0,\"name\":\"Name\",\"test\":\"contains \\\"e\\\"\"}],"
             "\"combine\":\"AND\",\"inView\":1,\"records\":4}\n");
   for (std::vector<std::string> bad :

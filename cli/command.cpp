@@ -30,7 +30,9 @@ std::vector<std::unique_ptr<Command>> Registry::All() const {
 }
 
 int UsageError(Context& ctx, const Command& command, const std::string& message) {
-  ctx.err << "cardovex-cli " << command.name() << ": " << message << "\n\n" << command.help();
+  ctx.err << "cardovex-cli " << command.name() << ": " << message << "\n";
+  // An error object for a script carries the message, not the usage text.
+  if (!ctx.json) ctx.err << "\n" << command.help();
   return kExitUsage;
 }
 

@@ -10,6 +10,7 @@
 
 #include "cli/args.h"
 #include "cli/command.h"
+#include "cli/json_output.h"
 #include "platform/locale_info.h"
 #include "platform/qt/qt_platform.h"
 #include "platform/text_codec.h"
@@ -40,7 +41,9 @@ constexpr const char* kGlobalHelp = R"(Global options (before or after the comma
   --yes, --no            the answer to every question the command asks; without
                          one, questions are asked on the terminal, or (with no
                          terminal) refused, and the command changes nothing
-  --json                 machine-readable output
+  --json                 machine-readable output: the result as one JSON
+                         document; a failure as {"error", "exitCode"} on
+                         stderr; commands with no result refuse it (exit 2)
   --help [COMMAND]       this text, or a command's own
   --version              the program's version
 
@@ -93,7 +96,15 @@ std::string GeneralHelp() {
   return s.str();
 }
 
+static int RunCommandLine(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
+                          CliUi& ui);
+
 int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream& err, CliUi& ui) {
+  return WithJsonErrors(args, err, [&] { return RunCommandLine(args, out, err, ui); });
+}
+
+static int RunCommandLine(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
+                          CliUi& ui) {
   LocaleInfo locale = SystemLocaleInfo();
   std::string dateSep, timeSep, password;
   bool dateSepGiven = false, timeSepGiven = false, passwordGiven = false, json = false, help = false;

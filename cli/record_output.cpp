@@ -3,6 +3,7 @@
 #include <ostream>
 
 #include "cli/json.h"
+#include "cli/typed_value.h"
 #include "engine/value_text.h"
 #include "platform/text_codec.h"
 
@@ -28,6 +29,8 @@ void WriteRecords(Context& ctx, const Database& db, const std::vector<size_t>& r
         j.Key("slot").Number(slot);
         j.Key("name").String(name(slot));
         j.Key("text").String(Cp1252ToUtf8(ValueText(vc, db.record(row), slot)));
+        j.Key("value");
+        WriteTypedValue(j, db.schema(), db.popups(), db.record(row), slot);
         j.EndObject();
       }
       j.EndArray();

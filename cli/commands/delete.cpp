@@ -7,6 +7,7 @@
 #include "cli/command_document.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/link_access.h"
 #include "ops/delete_records.h"
 #include "ops/links.h"
@@ -59,6 +60,11 @@ class DeleteCommand : public Command {
     const size_t deleted = DeleteRecordsCommand(session, scope, &linked);
     if (!QuestionsAnswered(ctx)) return kExitFailed;
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json) {
+      PrintCounts(ctx, {{"deleted", static_cast<int64_t>(deleted)},
+                        {"left", static_cast<int64_t>(db.recordCount())}});
+      return kExitOk;
+    }
     ctx.out << deleted << (deleted == 1 ? " record" : " records") << " deleted, " << db.recordCount()
             << " left\n";
     return kExitOk;

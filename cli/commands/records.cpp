@@ -34,8 +34,10 @@ class RecordsCommand : public Command {
            "that may only be read. The index printed is always the record's place in\n"
            "FILE, the INDEX that 'edit' and 'delete --record' take.\n"
            "With --json: an array of {\"index\": N, \"fields\": [{\"slot\", \"name\",\n"
-           "\"text\"}]}, line breaks kept. Without: a tab-separated table with a\n"
-           "header row, the index first, line breaks shown as blanks.\n";
+           "\"text\", \"value\"}]}, line breaks kept; \"value\" is typed and the same\n"
+           "under any conventions (numbers, true/false, \"YYYY-MM-DD\", \"HH:MM:SS\",\n"
+           "null for no value). Without: a tab-separated table with a header row,\n"
+           "the index first, line breaks shown as blanks.\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {

@@ -6,6 +6,7 @@
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/link_access.h"
 #include "ops/links.h"
 
@@ -60,6 +61,15 @@ class TransferCommand : public Command {
     TransferResult result = TransferRecordsTo(move_, which, session, target, services);
     if (!result.done || result.failed) return kExitFailed;
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json && move_) {
+      PrintCounts(ctx, {{"copied", static_cast<int64_t>(result.copied)},
+                        {"removed", static_cast<int64_t>(result.deleted)}});
+      return kExitOk;
+    }
+    if (ctx.json) {
+      PrintCounts(ctx, {{"copied", static_cast<int64_t>(result.copied)}});
+      return kExitOk;
+    }
     ctx.out << result.copied << (result.copied == 1 ? " record" : " records") << " copied";
     if (move_) ctx.out << ", " << result.deleted << " removed from " << args.positional()[0];
     ctx.out << "\n";

@@ -204,7 +204,7 @@ TEST(CliFilter, ShowingAndBadSpecsLeaveTheFile) {
   Result shown = Cli({"--json", "filter", path});
   ASSERT_EQ(shown.code, 0) << shown.err;
   EXPECT_EQ(shown.out,
-            "{\"filters\":[{\"enabled\":true,\"not\":false,\"slot\":1,\"name\":\"Qty\",\"test\":\"6 to 12\"},"
+            "{\"filters\":[{\"enabled\":true,\"not\":false,\"slot\":1,\"name\":\"Qty\",\"test\":\"6 to 12\",\"low\":6,\"high\":12},"
             "{\"enabled\":true,\"not\":true,\"slot\":0,\"name\":\"Name\",\"test\":\"contains \\\"e\\\"\"}],"
             "\"combine\":\"AND\",\"inView\":1,\"records\":4}\n");
   for (std::vector<std::string> bad :
@@ -248,7 +248,7 @@ TEST(CliFind, NothingFoundFailsAndTheSettingsAreSaved) {
   Result none = Cli({"--json", "find", path, "zzz", "--field", "Name", "--begins-with"});
   EXPECT_EQ(none.code, 1);
   EXPECT_EQ(none.out, "[]\n");
-  EXPECT_EQ(none.err, "ERROR!: Not Found in Database!\n");
+  EXPECT_EQ(none.err, "{\"error\":\"ERROR!: Not Found in Database!\",\"exitCode\":1}\n");
   Database db;
   testing::ScriptedUi ui;
   ASSERT_TRUE(db.Open(path, ui).ok());

@@ -31,6 +31,8 @@ class CliUi : public UiPort {
     password_ = password;
     passwordGiven_ = given;
   }
+  // The command whose error messages are shown (named in front of them).
+  void SetCommand(const std::string& name) { command_ = name; }
   // True once a question went unanswered (the command should fail).
   bool unanswered() const { return unanswered_; }
   int messagesShown() const { return messages_; }
@@ -39,6 +41,7 @@ class CliUi : public UiPort {
   std::ostream& err_;
   std::optional<bool> answer_;
   std::string password_;
+  std::string command_;
   bool passwordGiven_ = false;
   bool unanswered_ = false;
   int messages_ = 0;

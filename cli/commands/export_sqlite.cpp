@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <map>
 #include <memory>
 #include <optional>
 #include <ostream>
@@ -281,6 +282,8 @@ class ExportSqliteCommand : public Command {
            "and column it refers to when that database is exported too: a Link's\n"
            "linked records are those whose refColumn equals its value, e.g.\n"
            "  SELECT * FROM Contacts JOIN Orders ON Orders.Customer = Contacts.Orders\n"
+           "Where the Link's values are distinct and every linked record has its\n"
+           "parent, the column is also declared as a foreign key (REFERENCES) to it.\n"
            "OUT is replaced only once it is complete.\n"
            "  --force   write OUT even when it is a database or one of the FILEs\n"
            "With --json: {\"tables\": [{\"table\", \"file\", \"records\", \"columns\"}]}.\n";
@@ -374,11 +377,55 @@ class ExportSqliteCommand : public Command {
     return nullptr;
   }
 
+  // A child column that SQLite may be told refers to a parent's Link
+  // column, keyed by the child's table and slot.
+  struct Reference {
+    const Table* parent;
+    std::string column;
+  };
+  using References = std::map<std::pair<const Table*, int>, Reference>;
+
+  // Link values need not be unique, nor need every linked record have its
+  // parent; a foreign key stated where they are not would make SQLite
+  // refuse every change once its checks are on. So the reference is stated
+  // only where the data bear it out (cardovexSchema names it either way).
+  static References DeclarableReferences(const std::vector<Table>& tables) {
+    References found;
+    auto number = [](const SqlValue& v) { return std::get_if<int64_t>(&v); };
+    for (const Table& parent : tables) {
+      for (const Column& link : parent.columns) {
+        const FieldDef& field = parent.db->schema().field[link.slot];
+        if (field.type() != FieldType::Link) continue;
+        const Table* child = TableFor(tables, field.text.str());
+        if (!child || !std::any_of(child->columns.begin(), child->columns.end(),
+                                   [&](const Column& c) { return c.slot == field.otherField; })) {
+          continue;
+        }
+        std::set<int64_t> keys;
+        bool usable = true;
+        for (size_t r = 0; usable && r < parent.db->recordCount(); ++r) {
+          const SqlValue v = ValueOf(*parent.db, link.slot, FieldValue(parent.db->record(r), link.slot));
+          if (std::holds_alternative<std::monostate>(v)) continue;
+          usable = number(v) && keys.insert(*number(v)).second;
+        }
+        for (size_t r = 0; usable && r < child->db->recordCount(); ++r) {
+          const SqlValue v =
+              ValueOf(*child->db, field.otherField, FieldValue(child->db->record(r), field.otherField));
+          if (std::holds_alternative<std::monostate>(v)) continue;
+          usable = number(v) && keys.count(*number(v));
+        }
+        if (usable) found.emplace(std::make_pair(child, int(field.otherField)), Reference{&parent, link.name});
+      }
+    }
+    return found;
+  }
+
   static bool Fill(Writer& w, const std::vector<Table>& tables, std::string& problem) {
     auto fail = [&] {
       problem = w.error();
       return false;
     };
+    const References references = DeclarableReferences(tables);
     if (!w.Exec("BEGIN")) return fail();
     if (!w.Exec("CREATE TABLE cardovexSchema (tableName TEXT NOT NULL, columnName TEXT NOT NULL, "
                 "position INTEGER NOT NULL, sourceFile TEXT NOT NULL, databaseName TEXT NOT NULL, "
@@ -399,6 +446,9 @@ class ExportSqliteCommand : public Command {
       std::string create = "CREATE TABLE " + Quoted(t.name) + " (";
       for (size_t c = 0; c < t.columns.size(); ++c) {
         create += (c ? ", " : "") + Quoted(t.columns[c].name) + " " + SqlType(schema.field[t.columns[c].slot]);
+        if (auto ref = references.find({&t, t.columns[c].slot}); ref != references.end()) {
+          create += " REFERENCES " + Quoted(ref->second.parent->name) + " (" + Quoted(ref->second.column) + ")";
+        }
       }
       if (t.columns.empty()) create += "\"rowid\" INTEGER PRIMARY KEY";
       if (!w.Exec(create + ")")) return fail();
@@ -451,6 +501,18 @@ class ExportSqliteCommand : public Command {
           values[c] = ValueOf(*t.db, t.columns[c].slot, slots[t.columns[c].slot]);
         }
         if (!insert.Run(values)) return fail();
+      }
+    }
+    // A key that is referred to must be unique for SQLite to accept it.
+    std::set<std::pair<const Table*, std::string>> keys;
+    for (const auto& [child, ref] : references) keys.emplace(ref.parent, ref.column);
+    std::set<std::string> taken = {"cardovexschema", "cardovexpopups"};
+    for (const Table& t : tables) taken.insert(Folded(t.name));
+    for (const auto& [parent, column] : keys) {
+      const std::string index = FreeName(parent->name + " " + column + " key", taken);
+      if (!w.Exec("CREATE UNIQUE INDEX " + Quoted(index) + " ON " + Quoted(parent->name) + " (" +
+                  Quoted(column) + ")")) {
+        return fail();
       }
     }
     if (!w.Exec("COMMIT")) return fail();

@@ -94,6 +94,35 @@ TEST_F(ExportSqlite, LinksJoinAcrossTables) {
   EXPECT_EQ(Q("SELECT c.Name, count(*) FROM Contacts c JOIN Orders o ON o.Customer = c.Orders "
               "GROUP BY c.Name ORDER BY c.Name;"),
             "Ana Müller|3\nBob O'Neil|1\nChloé Dubois|1\n");
+  // Every order has its contact, and contacts' link values are distinct, so
+  // SQLite is told of the reference and holds to it.
+  EXPECT_EQ(Q("SELECT \"table\", \"from\", \"to\" FROM pragma_foreign_key_list('Orders');"),
+            "Contacts|Customer|Orders\n");
+  EXPECT_EQ(Q("PRAGMA foreign_key_check;"), "");
+  EXPECT_NE(Q("PRAGMA foreign_keys = ON; INSERT INTO Orders (Customer) VALUES (99);")
+                .find("FOREIGN KEY constraint failed"),
+            std::string::npos);
+}
+
+TEST(ExportSqliteLinks, AReferenceTheDataDoNotBearIsOnlyNamed) {
+  testing::TempDir dir;
+  std::vector<uint8_t> contacts;
+  ASSERT_TRUE(ReadWholeFile(Sample("Contacts"), contacts));
+  ASSERT_TRUE(WriteFileSafely(dir.File("Contacts.PDB"), contacts.data(), contacts.size()).ok());
+  const std::string orders = dir.File("Orders.PDB"), csv = dir.File("orders.csv");
+  ASSERT_EQ(Cli({"new", orders, "--name", "Orders", "--field", "Item:Text", "--field", "Note:Text",
+                 "--field", "Customer:Integer"})
+                .code,
+            0);
+  std::ofstream(csv) << "Tea,,1\nCups,,99\n";
+  ASSERT_EQ(Cli({"import-csv", orders, csv}).code, 0);
+  const std::string out = dir.File("out.sqlite");
+  Result r = Cli({"export-sqlite", dir.File("Contacts.PDB"), orders, out});
+  ASSERT_EQ(r.code, 0) << r.err;
+  EXPECT_EQ(Sql(dir, out, "SELECT count(*) FROM pragma_foreign_key_list('Orders');"), "0\n");
+  EXPECT_EQ(Sql(dir, out, "SELECT refTable || '.' || refColumn FROM cardovexSchema WHERE columnName = 'Orders';"),
+            "Orders.Customer\n");
+  EXPECT_EQ(Sql(dir, out, "SELECT o.Item FROM Contacts c JOIN Orders o ON o.Customer = c.Orders;"), "Tea\n");
 }
 
 TEST(ExportSqliteNames, CollisionsGetFreeNamesAndInputsAreProtected) {

@@ -491,7 +491,15 @@ class ExportSqliteCommand : public Command {
         }
       }
 
-      if (t.columns.empty()) continue;
+      // A database of headings alone still has its records: one empty row each.
+      if (t.columns.empty()) {
+        Writer::Insert empty(w.handle(), "INSERT INTO " + Quoted(t.name) + " DEFAULT VALUES");
+        if (!empty.ok()) return fail();
+        for (size_t r = 0; r < t.db->recordCount(); ++r) {
+          if (!empty.Run({})) return fail();
+        }
+        continue;
+      }
       Writer::Insert insert(w.handle(), InsertSql(t.name, t.columns.size()));
       if (!insert.ok()) return fail();
       std::vector<SqlValue> values(t.columns.size());

@@ -6,6 +6,7 @@
 #include <sstream>
 
 #include "cli/global_options.h"
+#include "engine/record.h"
 #include "engine/record_store.h"
 #include "platform/file_io.h"
 #include "tests/support/test_support.h"
@@ -148,6 +149,19 @@ TEST(ExportSqliteNames, CollisionsGetFreeNamesAndInputsAreProtected) {
   ASSERT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(Sql(dir, out, "SELECT tableName || '.' || columnName FROM cardovexSchema ORDER BY 1;"),
             "db sqlite_master (2).Y\ndb sqlite_master.X\ndb sqlite_master.x (2)\n");
+
+  // Headings alone give no column, yet every record is a row.
+  const std::string heads = dir.File("Heads.PDB");
+  ASSERT_EQ(Cli({"new", heads, "--name", "Heads", "--field", "Top:Heading"}).code, 0);
+  {
+    Database db;
+    SilentUi ui;
+    ASSERT_TRUE(db.Open(heads, ui).ok());
+    for (int i = 0; i < 2; ++i) db.AppendRecord(Compact(NewEditingRecord(db.schema()), db.schema()));
+    ASSERT_TRUE(db.Save().ok());
+  }
+  ASSERT_EQ(Cli({"export-sqlite", heads, out}).code, 0);
+  EXPECT_EQ(Sql(dir, out, "SELECT count(*) FROM Heads;"), "2\n");
 
   EXPECT_EQ(Cli({"export-sqlite", a, "-"}).code, 2);
   EXPECT_EQ(Cli({"export-sqlite", out}).code, 2);

@@ -57,8 +57,13 @@ std::string Clean(const std::string& text) {
 }
 }  // namespace
 
-void CliUi::ShowMessage(const std::string& text, const std::string& caption, MessageIcon) {
+void CliUi::ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) {
   ++messages_;
+  // Errors and warnings carry the tool's and the command's name as every
+  // other diagnostic does; a notice such as a print confirmation does not.
+  if ((icon == MessageIcon::Error || icon == MessageIcon::Warning) && !command_.empty()) {
+    err_ << "cardovex-cli: " << command_ << ": ";
+  }
   err_ << (caption.empty() ? "" : Clean(caption) + ": ") << Clean(text) << "\n";
 }
 

@@ -32,6 +32,8 @@ class CliUi : public UiPort {
     password_ = password;
     passwordGiven_ = given;
   }
+  // The command whose error messages are shown (named in front of them).
+  void SetCommand(const std::string& name) { command_ = name; }
   // True once a question went unanswered (the command should fail).
   bool unanswered() const { return unanswered_; }
   int messagesShown() const { return messages_; }
@@ -40,6 +42,7 @@ class CliUi : public UiPort {
   std::ostream& err_;
   std::optional<bool> answer_;
   std::string password_;
+  std::string command_;
   bool passwordGiven_ = false;
   std::optional<std::string> typed_;  // at the terminal, for later checks
   bool unanswered_ = false;

@@ -44,8 +44,8 @@ constexpr const char* kGlobalHelp = R"(Global options (before or after the comma
   --json                 machine-readable output: the result as one JSON
                          document; a failure as {"error", "exitCode"} on
                          stderr; commands with no result refuse it (exit 2)
-  --help [COMMAND]       this text, or a command's own
-  --version              the program's version
+  --help [COMMAND]       this text, or a command's own (also: help [COMMAND])
+  -V, --version          the program's version
 
 Exit codes: 0 success, 1 the operation failed (the message is on stderr),
 2 usage error.
@@ -113,6 +113,12 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
 
   for (size_t i = 0; i < args.size(); ++i) {
     const std::string& a = args[i];
+    // After "--" nothing is an option, global or not: the command's own
+    // parser gets the marker and the arguments behind it as they are.
+    if (a == "--") {
+      rest.insert(rest.end(), args.begin() + static_cast<std::ptrdiff_t>(i), args.end());
+      break;
+    }
     std::string name = a.substr(0, a.find('='));
     std::string value;
     auto need = [&](std::string& into) {
@@ -182,7 +188,7 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
       answer = false;
     } else if (a == "--help" || a == "-h") {
       help = true;
-    } else if (a == "--version") {
+    } else if (a == "--version" || a == "-V") {
       out << "cardovex-cli " << CARDOVEX_VERSION << "\n";
       return kExitOk;
     } else {
@@ -202,12 +208,22 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
     (help ? out : err) << GeneralHelp();
     return help ? kExitOk : kExitUsage;
   }
-  auto command = Registry::Instance().Find(rest[0]);
-  if (!command) {
-    if (help && rest[0] == "help") {
+  // "help [COMMAND]" is read as "--help [COMMAND]", the spelling other
+  // tools have taught many users.
+  if (rest[0] == "help" && !Registry::Instance().Find("help")) {
+    if (rest.size() > 2) {
+      err << "cardovex-cli: help: expected at most one COMMAND\n";
+      return kExitUsage;
+    }
+    rest.erase(rest.begin());
+    if (rest.empty()) {
       out << GeneralHelp();
       return kExitOk;
     }
+    help = true;
+  }
+  auto command = Registry::Instance().Find(rest[0]);
+  if (!command) {
     err << "cardovex-cli: unknown command '" << rest[0] << "' (see --help)\n";
     return kExitUsage;
   }
@@ -218,6 +234,8 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
   ui.SetAnswer(answer);
   ui.SetPassword(password, passwordGiven);
   Context ctx{locale, password, json, out, err, ui};
+  ctx.command = command->name();
+  ui.SetCommand(ctx.command);
   std::vector<std::string> commandArgs(rest.begin() + 1, rest.end());
   int code = command->Run(ctx, commandArgs);
   if (code == kExitOk && ui.unanswered()) code = kExitFailed;

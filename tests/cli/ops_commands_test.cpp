@@ -248,7 +248,7 @@ TEST(CliFind, NothingFoundFailsAndTheSettingsAreSaved) {
   Result none = Cli({"--json", "find", path, "zzz", "--field", "Name", "--begins-with"});
   EXPECT_EQ(none.code, 1);
   EXPECT_EQ(none.out, "[]\n");
-  EXPECT_EQ(none.err, "{\"error\":\"ERROR!: Not Found in Database!\",\"exitCode\":1}\n");
+  EXPECT_EQ(none.err, "{\"error\":\"cardovex-cli: find: ERROR!: Not Found in Database!\",\"exitCode\":1}\n");
   Database db;
   testing::ScriptedUi ui;
   ASSERT_TRUE(db.Open(path, ui).ok());

@@ -8,10 +8,11 @@
 #include "ops/csv_export.h"
 #include "ops/csv_import.h"
 #include "ops/session.h"
+#include "ops/text_encoding.h"
 
 namespace cx {
 
-enum class CsvEncoding { kUtf8, kWindows1252 };
+using CsvEncoding = TextEncoding;
 
 // Writes the export to `path` (replaced only once complete). 1 when every
 // record was written, 0 as ExportCsv says; a file that cannot be written
@@ -19,9 +20,10 @@ enum class CsvEncoding { kUtf8, kWindows1252 };
 int ExportCsvEncoded(const DataSession& session, const CsvExportOptions& options, CsvEncoding encoding,
                      const std::string& path, std::string& error);
 
-// Appends the lines of the file at `path`. A UTF-8 file is first turned
-// into Windows-1252 in `scratchFolder`; one holding a character that code
-// page lacks is refused before anything is added.
+// Appends the lines of the file at `path`. A UTF-8 file holding a character
+// that Windows-1252 lacks is refused before anything is added; the message
+// names the first line holding one. `scratchFolder` is no longer used: the
+// conversion happens in memory.
 CsvImportResult ImportCsvEncoded(Database& db, const std::string& path, int mode, CsvEncoding encoding,
                                  const LocaleInfo& locale, const std::string& scratchFolder);
 

@@ -1,7 +1,8 @@
 // The user-interface port of the command-line tool: messages go to stderr;
 // questions are answered by --yes / --no and refused without them; the
-// password prompt is answered by --password, once: a wrong one is refused
-// rather than asked again.
+// password prompt is answered by --password (or --password-file), once: a
+// wrong one is refused rather than asked again. Without either, a terminal
+// is asked, without echo.
 #pragma once
 
 #include <iosfwd>
@@ -31,6 +32,8 @@ class CliUi : public UiPort {
     password_ = password;
     passwordGiven_ = given;
   }
+  // The command whose error messages are shown (named in front of them).
+  void SetCommand(const std::string& name) { command_ = name; }
   // True once a question went unanswered (the command should fail).
   bool unanswered() const { return unanswered_; }
   int messagesShown() const { return messages_; }
@@ -39,7 +42,9 @@ class CliUi : public UiPort {
   std::ostream& err_;
   std::optional<bool> answer_;
   std::string password_;
+  std::string command_;
   bool passwordGiven_ = false;
+  std::optional<std::string> typed_;  // at the terminal, for later checks
   bool unanswered_ = false;
   int messages_ = 0;
 };

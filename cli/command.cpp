@@ -30,14 +30,16 @@ std::vector<std::unique_ptr<Command>> Registry::All() const {
 }
 
 int UsageError(Context& ctx, const Command& command, const std::string& message) {
-  ctx.err << "cardovex-cli " << command.name() << ": " << message << "\n\n" << command.help();
+  ctx.err << "cardovex-cli: " << command.name() << ": " << message << "\n";
+  // An error object for a script carries the message, not the usage text.
+  if (!ctx.json) ctx.err << "\n" << command.help();
   return kExitUsage;
 }
 
 int Failure(Context& ctx, const std::string& message) {
   std::string text = Cp1252ToUtf8(message);
   while (!text.empty() && text.back() == '\n') text.pop_back();
-  ctx.err << text << "\n";
+  ctx.err << "cardovex-cli: " << (ctx.command.empty() ? "" : ctx.command + ": ") << text << "\n";
   return kExitFailed;
 }
 

@@ -30,6 +30,9 @@ struct Context {
   // Locks on the databases the command works on, held until it ends, so
   // that commands run side by side take turns instead of losing updates.
   std::vector<std::unique_ptr<FileLock>> locks = {};
+  // The command being run, named in every error line so that a script
+  // running several commands can tell which one complained.
+  std::string command = {};
 };
 
 class Command {
@@ -66,7 +69,8 @@ struct Registration {
 
 // Usage error: prints the message and the command's usage, returns 2.
 int UsageError(Context& ctx, const Command& command, const std::string& message);
-// Operation failed: prints the message (UTF-8) on stderr, returns 1.
+// Operation failed: prints "cardovex-cli: COMMAND: message" (UTF-8) on
+// stderr, returns 1.
 int Failure(Context& ctx, const std::string& message);
 
 }  // namespace cx::cli

@@ -6,7 +6,9 @@
 
 #include "cli/args.h"
 #include "design/security.h"
+#include "engine/database_folder.h"
 #include "ops/open_database.h"
+#include "platform/data_folder.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {
@@ -22,6 +24,16 @@ bool SameFileAs(const FileState& a, const FileState& b) {
 }
 
 }  // namespace
+
+std::string LocateDatabase(const std::string& path) {
+  if (path.empty() || path == "-" || path.find('/') != std::string::npos || StatFile(path)) return path;
+  const std::string folder = DataFolder();
+  for (const std::string& name : {path, path + ".PDB"}) {
+    const std::string candidate = DatabasePath(folder, name);
+    if (StatFile(candidate)) return candidate;
+  }
+  return path;
+}
 
 bool LockDatabases(Context& ctx, const std::vector<std::string>& paths) {
   std::vector<std::pair<FileState, std::string>> wanted;
@@ -54,13 +66,15 @@ bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
   return OpenForCommand(ctx, path, session);
 }
 
-bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session) {
+bool OpenForCommand(Context& ctx, const std::string& given, DataSession& session) {
+  const std::string path = LocateDatabase(given);
   if (!LockDatabases(ctx, {path})) return false;
   if (!CheckOpenAccess(path, ctx.ui)) return false;
   return OpenDatabase(session, path).ok();
 }
 
-bool OpenHeadForCommand(Context& ctx, const std::string& path, DatabaseHead& head) {
+bool OpenHeadForCommand(Context& ctx, const std::string& given, DatabaseHead& head) {
+  const std::string path = LocateDatabase(given);
   if (Status read = ReadDatabaseHead(path, head); !read) {
     ctx.ui.ShowMessage(read.message(), "Error", MessageIcon::Error);
     return false;

@@ -13,6 +13,11 @@
 
 namespace cx::cli {
 
+// FILE as a command names it: a name without a folder that is not a file
+// where the command runs is looked for in the data folder, as given and
+// then with ".PDB" added. Anything else is returned unchanged.
+std::string LocateDatabase(const std::string& path);
+
 // Locks the databases at `paths` for the rest of the command, waiting a
 // while for another command that holds one. False after printing the
 // message when one stays busy. Files that do not exist are not locked.

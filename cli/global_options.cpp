@@ -2,11 +2,15 @@
 
 #include <cerrno>
 #include <cstring>
+#include <fstream>
+#include <iostream>
+#include <optional>
 #include <ostream>
 #include <sstream>
 
 #include "cli/args.h"
 #include "cli/command.h"
+#include "cli/json_output.h"
 #include "platform/locale_info.h"
 #include "platform/qt/qt_platform.h"
 #include "platform/text_codec.h"
@@ -29,13 +33,19 @@ constexpr const char* kGlobalHelp = R"(Global options (before or after the comma
   --decimal C            decimal separator (a value other than "." makes numbers
                          use ",")
                          Defaults for all of these come from the system locale.
-  --password TEXT        the password of a protected database
+  --password TEXT        the password of a protected database (other users of
+                         the machine can read it in the process list)
+  --password-file FILE   the password from the first line of FILE, or of
+                         standard input with -; without either, a terminal
+                         is asked for it without echo
   --yes, --no            the answer to every question the command asks; without
                          one, questions are asked on the terminal, or (with no
                          terminal) refused, and the command changes nothing
-  --json                 machine-readable output
-  --help [COMMAND]       this text, or a command's own
-  --version              the program's version
+  --json                 machine-readable output: the result as one JSON
+                         document; a failure as {"error", "exitCode"} on
+                         stderr; commands with no result refuse it (exit 2)
+  --help [COMMAND]       this text, or a command's own (also: help [COMMAND])
+  -V, --version          the program's version
 
 Exit codes: 0 success, 1 the operation failed (the message is on stderr),
 2 usage error.
@@ -50,6 +60,25 @@ bool TakeValue(const std::vector<std::string>& args, size_t& i, std::string& val
   if (i + 1 >= args.size()) return false;
   value = args[++i];
   return true;
+}
+
+// The first line of a file (or of standard input for "-"), without its
+// line end; nothing when it cannot be read. An empty file is an empty
+// password, as an empty --password is.
+std::optional<std::string> ReadPasswordLine(const std::string& file) {
+  errno = 0;
+  std::string line;
+  if (file == "-") {
+    std::getline(std::cin, line);
+    if (std::cin.bad()) return std::nullopt;
+  } else {
+    std::ifstream in(file, std::ios::binary);
+    if (!in) return std::nullopt;
+    std::getline(in, line);
+    if (in.bad()) return std::nullopt;
+  }
+  if (!line.empty() && line.back() == '\r') line.pop_back();
+  return line;
 }
 
 }  // namespace
@@ -67,7 +96,15 @@ std::string GeneralHelp() {
   return s.str();
 }
 
+static int RunCommandLine(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
+                          CliUi& ui);
+
 int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream& err, CliUi& ui) {
+  return WithJsonErrors(args, err, [&] { return RunCommandLine(args, out, err, ui); });
+}
+
+static int RunCommandLine(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
+                          CliUi& ui) {
   LocaleInfo locale = SystemLocaleInfo();
   std::string dateSep, timeSep, password;
   bool dateSepGiven = false, timeSepGiven = false, passwordGiven = false, json = false, help = false;
@@ -76,6 +113,12 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
 
   for (size_t i = 0; i < args.size(); ++i) {
     const std::string& a = args[i];
+    // After "--" nothing is an option, global or not: the command's own
+    // parser gets the marker and the arguments behind it as they are.
+    if (a == "--") {
+      rest.insert(rest.end(), args.begin() + static_cast<std::ptrdiff_t>(i), args.end());
+      break;
+    }
     std::string name = a.substr(0, a.find('='));
     std::string value;
     auto need = [&](std::string& into) {
@@ -121,6 +164,22 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
       }
       password = std::move(stored);
       passwordGiven = true;
+    } else if (name == "--password-file") {
+      std::string file;
+      if (!need(file)) return kExitUsage;
+      std::optional<std::string> line = ReadPasswordLine(file);
+      if (!line) {
+        err << "cardovex-cli: --password-file: cannot read " << (file == "-" ? "standard input" : file)
+            << (errno ? std::string(": ") + std::strerror(errno) : std::string()) << "\n";
+        return kExitFailed;
+      }
+      std::string stored, error;
+      if (!ToStoredText(*line, "the password in " + file, stored, error)) {
+        err << "cardovex-cli: " << error << "\n";
+        return kExitUsage;
+      }
+      password = std::move(stored);
+      passwordGiven = true;
     } else if (a == "--json") {
       json = true;
     } else if (a == "--yes") {
@@ -129,7 +188,7 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
       answer = false;
     } else if (a == "--help" || a == "-h") {
       help = true;
-    } else if (a == "--version") {
+    } else if (a == "--version" || a == "-V") {
       out << "cardovex-cli " << CARDOVEX_VERSION << "\n";
       return kExitOk;
     } else {
@@ -149,12 +208,22 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
     (help ? out : err) << GeneralHelp();
     return help ? kExitOk : kExitUsage;
   }
-  auto command = Registry::Instance().Find(rest[0]);
-  if (!command) {
-    if (help && rest[0] == "help") {
+  // "help [COMMAND]" is read as "--help [COMMAND]", the spelling other
+  // tools have taught many users.
+  if (rest[0] == "help" && !Registry::Instance().Find("help")) {
+    if (rest.size() > 2) {
+      err << "cardovex-cli: help: expected at most one COMMAND\n";
+      return kExitUsage;
+    }
+    rest.erase(rest.begin());
+    if (rest.empty()) {
       out << GeneralHelp();
       return kExitOk;
     }
+    help = true;
+  }
+  auto command = Registry::Instance().Find(rest[0]);
+  if (!command) {
     err << "cardovex-cli: unknown command '" << rest[0] << "' (see --help)\n";
     return kExitUsage;
   }
@@ -165,6 +234,8 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
   ui.SetAnswer(answer);
   ui.SetPassword(password, passwordGiven);
   Context ctx{locale, password, json, out, err, ui};
+  ctx.command = command->name();
+  ui.SetCommand(ctx.command);
   std::vector<std::string> commandArgs(rest.begin() + 1, rest.end());
   int code = command->Run(ctx, commandArgs);
   if (code == kExitOk && ui.unanswered()) code = kExitFailed;

@@ -1,5 +1,7 @@
 #include "cli/json.h"
 
+#include <charconv>
+#include <cmath>
 #include <cstdio>
 
 namespace cx::cli {
@@ -76,6 +78,19 @@ JsonWriter& JsonWriter::Number(int64_t value) {
 JsonWriter& JsonWriter::Bool(bool value) {
   Separate();
   out_ << (value ? "true" : "false");
+  return *this;
+}
+JsonWriter& JsonWriter::Null() {
+  Separate();
+  out_ << "null";
+  return *this;
+}
+JsonWriter& JsonWriter::Double(double value) {
+  if (!std::isfinite(value)) return Null();
+  Separate();
+  char buf[32];
+  auto end = std::to_chars(buf, buf + sizeof buf, value).ptr;
+  out_.write(buf, end - buf);
   return *this;
 }
 void JsonWriter::Finish() { out_ << "\n"; }

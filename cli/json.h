@@ -20,6 +20,10 @@ class JsonWriter {
   JsonWriter& String(const std::string& value);
   JsonWriter& Number(int64_t value);
   JsonWriter& Bool(bool value);
+  JsonWriter& Null();
+  // The shortest text that reads back as `value`, with "." whatever the
+  // locale; a value that is not finite becomes null.
+  JsonWriter& Double(double value);
   // Ends the document with a newline.
   void Finish();
 

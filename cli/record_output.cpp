@@ -3,6 +3,7 @@
 #include <ostream>
 
 #include "cli/json.h"
+#include "cli/typed_value.h"
 #include "engine/value_text.h"
 #include "platform/text_codec.h"
 
@@ -28,6 +29,8 @@ void WriteRecords(Context& ctx, const Database& db, const std::vector<size_t>& r
         j.Key("slot").Number(slot);
         j.Key("name").String(name(slot));
         j.Key("text").String(Cp1252ToUtf8(ValueText(vc, db.record(row), slot)));
+        j.Key("value");
+        WriteTypedValue(j, db.schema(), db.popups(), db.record(row), slot);
         j.EndObject();
       }
       j.EndArray();
@@ -38,16 +41,17 @@ void WriteRecords(Context& ctx, const Database& db, const std::vector<size_t>& r
     return;
   }
 
-  std::string line;
+  // The index leads, so that a row found here can be named to edit or delete.
+  std::string line = "Index";
   for (size_t k = 0; k < slots.size(); ++k) {
-    if (k) line.push_back('\t');
+    line.push_back('\t');
     line += name(slots[k]);
   }
   ctx.out << line << "\n";
   for (size_t row : rows) {
-    line.clear();
+    line = std::to_string(row);
     for (size_t k = 0; k < slots.size(); ++k) {
-      if (k) line.push_back('\t');
+      line.push_back('\t');
       std::string text = OneLine(ValueText(vc, db.record(row), slots[k]));
       for (char& c : text) {
         if (c == '\t') c = ' ';

@@ -10,8 +10,9 @@
 
 namespace cx::cli {
 
-// --json: [{"index": N, "fields": [{"slot", "name", "text"}]}] with line
-// breaks kept; otherwise a tab-separated table with a header row and
+// --json: [{"index": N, "fields": [{"slot", "name", "text", "value"}]}]
+// with line breaks kept ("value" as WriteTypedValue gives it); otherwise a
+// tab-separated table with a header row, the record's index first and
 // one-line values.
 void WriteRecords(Context& ctx, const Database& db, const std::vector<size_t>& rows);
 

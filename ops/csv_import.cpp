@@ -341,20 +341,21 @@ bool ImportCsvRecord(Database& db, const CsvLine& line, int mode, const LocaleIn
   return db.AppendRecord(Compact(editing, schema));
 }
 
-CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
-                              const CsvSettings& settings, const LocaleInfo& locale, bool strict) {
+namespace {
+
+// Both passes read the header line, if any, and pass it by.
+CsvImportResult ImportCsvStream(Database& db, CsvStream& in, const std::string& path, int mode,
+                                const CsvSettings& settings, const LocaleInfo& locale, bool strict,
+                                bool skipHeader) {
   CsvImportResult result;
-  CsvStream in;
-  if (Status s = in.Open(path); !s) {
-    result.status = s;
-    return result;
-  }
   const Schema& schema = db.schema();
   const ColumnMap columns = Columns(schema, mode);
   CsvLine line;
   uint32_t largest = 0;
   IssueFinder finder(db, mode, locale);
   size_t fileLine = 1;
+  if (skipHeader && ReadCsvLine(in, line, settings.separator)) fileLine += 1 + line.innerLineEnds;
+  const uint64_t firstRecord = in.Tell();
   while (ReadCsvLine(in, line, settings.separator)) {
     ++result.lines;
     finder.Check(line, fileLine, result.issues);
@@ -387,7 +388,7 @@ CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
   if (largest != 0 && largest != UINT32_MAX && largest >= db.NextUniqueNumber()) {
     db.SetNextUniqueNumber(largest + 1);
   }
-  in.Seek(0);
+  in.Seek(firstRecord);
   Bytes editing;
   while (ReadCsvLine(in, line, settings.separator)) {
     if (!ImportCsvRecord(db, line, mode, locale, &editing)) break;
@@ -395,6 +396,27 @@ CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
   }
   if (in.failed()) result.status = Status::Error("Cannot read " + path);
   return result;
+}
+
+}  // namespace
+
+CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
+                              const CsvSettings& settings, const LocaleInfo& locale, bool strict,
+                              bool skipHeader) {
+  CsvStream in;
+  if (Status s = in.Open(path); !s) {
+    CsvImportResult result;
+    result.status = s;
+    return result;
+  }
+  return ImportCsvStream(db, in, path, mode, settings, locale, strict, skipHeader);
+}
+
+CsvImportResult ImportCsvText(Database& db, std::string text, const std::string& name, int mode,
+                              const CsvSettings& settings, const LocaleInfo& locale, bool strict,
+                              bool skipHeader) {
+  CsvStream in(std::move(text));
+  return ImportCsvStream(db, in, name, mode, settings, locale, strict, skipHeader);
 }
 
 }  // namespace cx

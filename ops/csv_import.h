@@ -78,9 +78,16 @@ struct CsvImportResult {
 // import. A file with more lines than the database has room for is
 // refused before anything is added. The first reading also finds the
 // values the rules will not store as given (`issues`); with `strict` any of
-// them refuses the file, again before anything is added.
+// them refuses the file, again before anything is added. With `skipHeader`
+// the first line is a header of names: it is read past, never imported,
+// and still counted in the line numbers of `issues`.
 CsvImportResult ImportCsvFile(Database& db, const std::string& path, int mode,
                               const CsvSettings& settings, const LocaleInfo& locale,
-                              bool strict = false);
+                              bool strict = false, bool skipHeader = false);
+// The same for Windows-1252 text already in memory (standard input, or a
+// file converted from another encoding); `name` stands for it in messages.
+CsvImportResult ImportCsvText(Database& db, std::string text, const std::string& name, int mode,
+                              const CsvSettings& settings, const LocaleInfo& locale,
+                              bool strict = false, bool skipHeader = false);
 
 }  // namespace cx

@@ -1,7 +1,7 @@
 # Builds one sample database from its readable sources:
 #   cmake -DCLI=... -DSRC=<dir> -DOUT=<dir> -DNAME=<Name> -P make_sample.cmake
-# NAME.fields holds the field descriptions, NAME.csv the records (UTF-8;
-# converted to the files' Windows-1252 here).
+# NAME.fields holds the field descriptions, NAME.csv the records (UTF-8,
+# which import-csv reads by default).
 cmake_minimum_required(VERSION 3.25)
 
 set(locale --date-format M/d/yyyy --time-format "h:mm:ss tt" --decimal .)
@@ -38,13 +38,7 @@ if(used LESS 30)
   endforeach()
 endif()
 
-execute_process(COMMAND iconv -f UTF-8 -t WINDOWS-1252 ${SRC}/${NAME}.csv
-                OUTPUT_FILE ${OUT}/${NAME}.cp1252.csv RESULT_VARIABLE rc)
-if(NOT rc EQUAL 0)
-  message(FATAL_ERROR "iconv failed on ${NAME}.csv")
-endif()
-run(import-csv ${db} ${OUT}/${NAME}.cp1252.csv)
-file(REMOVE ${OUT}/${NAME}.cp1252.csv)
+run(import-csv ${db} ${SRC}/${NAME}.csv)
 run(recalc ${db})
 
 if(NAME STREQUAL "Vault")

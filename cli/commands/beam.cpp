@@ -5,6 +5,7 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/security.h"
 #include "infrared/beam_commands.h"
 #include "platform/qt/qt_platform.h"
@@ -27,6 +28,7 @@ class BeamCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--to", "--record", "--wait"}, {"--records"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

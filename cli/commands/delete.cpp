@@ -4,8 +4,10 @@
 
 #include "cli/args.h"
 #include "cli/command.h"
+#include "cli/command_document.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/link_access.h"
 #include "ops/delete_records.h"
 #include "ops/links.h"
@@ -19,12 +21,13 @@ class DeleteCommand : public Command {
   std::string summary() const override { return "delete the records within or outside the filter range, or all"; }
   std::string help() const override {
     return "Usage: cardovex-cli [--password PW] [--yes|--no] delete FILE\n"
-           "                    --within | --outside | --all\n"
+           "                    --within | --outside | --all | --record INDEX\n"
            "Deletes records and saves FILE:\n"
            "  --within    \"All Records _Within_ Filter Range\": the records in view\n"
            "  --outside   \"All Records _Outside_ Filter Range\": the others (none when\n"
            "              both filters are off)\n"
            "  --all       \"All Records\"\n"
+           "  --record INDEX   the one record INDEX (as 'records' numbers it)\n"
            "Needs the \"Delete Records\" access. When FILE has Link fields the question\n"
            "\"Would you like to delete the linked records also? (Y/N)\" is answered by\n"
            "--yes (the linked records in the other databases go too, each database\n"
@@ -34,11 +37,14 @@ class DeleteCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--within", "--outside", "--all"});
+    Args args(argv, {"--record"}, {"--within", "--outside", "--all"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
-    const int scopes = args.has("--within") + args.has("--outside") + args.has("--all");
-    if (scopes != 1) return UsageError(ctx, *this, "give exactly one of --within, --outside, --all");
+    const int scopes = args.has("--within") + args.has("--outside") + args.has("--all") + args.has("--record");
+    if (scopes != 1) {
+      return UsageError(ctx, *this, "give exactly one of --within, --outside, --all, --record");
+    }
+    if (args.has("--record")) return DeleteOne(ctx, args);
     const DeleteScope scope = args.has("--within")    ? DeleteScope::WithinFilterRange
                               : args.has("--outside") ? DeleteScope::OutsideFilterRange
                                                       : DeleteScope::All;
@@ -54,8 +60,33 @@ class DeleteCommand : public Command {
     const size_t deleted = DeleteRecordsCommand(session, scope, &linked);
     if (!QuestionsAnswered(ctx)) return kExitFailed;
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json) {
+      PrintCounts(ctx, {{"deleted", static_cast<int64_t>(deleted)},
+                        {"left", static_cast<int64_t>(db.recordCount())}});
+      return kExitOk;
+    }
     ctx.out << deleted << (deleted == 1 ? " record" : " records") << " deleted, " << db.recordCount()
             << " left\n";
+    return kExitOk;
+  }
+
+ private:
+  // The list's "Delete Record": the command line itself is the confirmation,
+  // so only the linked-records question is asked.
+  int DeleteOne(Context& ctx, const Args& args) {
+    Database db;
+    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    std::optional<size_t> record;
+    std::string error;
+    if (!RecordOption(args, db, record, error)) return UsageError(ctx, *this, error);
+    if (!PassAccessCheck(ctx, db, secured::kDeleteRecords)) return kExitFailed;
+    const bool alsoLinked =
+        HasLinkFields(db) && ctx.ui.AskYesNo(link_messages::kDeleteLinkedQuestion, "QUESTION");
+    if (!QuestionsAnswered(ctx)) return kExitFailed;
+    CommandDocument cd(ctx, db);
+    if (!cd.doc().DeleteRecord(*record, alsoLinked)) return Failure(ctx, "the record could not be deleted");
+    if (!SaveForCommand(ctx, db)) return kExitFailed;
+    ctx.out << "record " << *record << " deleted, " << db.recordCount() << " left\n";
     return kExitOk;
   }
 };

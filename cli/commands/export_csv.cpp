@@ -3,6 +3,8 @@
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
+#include "cli/text_files.h"
 #include "ops/csv_export.h"
 
 namespace cx::cli {
@@ -14,15 +16,16 @@ class ExportCsvCommand : public Command {
   std::string summary() const override { return "write the records as comma-separated text"; }
   std::string help() const override {
     return "Usage: cardovex-cli export-csv FILE OUT [--quote-all] [--header] [--filtered]\n"
-           "                                [--slot-order] [--force]\n"
+           "                                [--slot-order] [--encoding E] [--force]\n"
            "Writes one line per record, each value as the list shows it (\"No Value\"\n"
            "where that is empty; Image columns stay empty), lines ending in LF, in\n"
-           "Windows-1252. OUT '-' writes to standard output in UTF-8.\n"
+           "UTF-8. OUT '-' writes to standard output.\n"
            "  --quote-all   quote every value (and the header's names)\n"
            "  --header      a first line of field names\n"
            "  --filtered    only the records in view (those that pass the filters)\n"
            "  --slot-order  columns in field slot order instead of display order\n"
-           "  --force       write OUT even when it is a database or FILE itself\n"
+           "  --force       write OUT even when it is a database or FILE itself\n" +
+           std::string(kEncodingHelp) +
            "OUT is replaced only once the whole text is written; a FIFO or a device\n"
            "named as OUT is written into.\n"
            "Columns are the used fields. When the first field of the order is\n"
@@ -30,8 +33,11 @@ class ExportCsvCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--quote-all", "--header", "--filtered", "--slot-order", "--force"});
+    if (int code = RefuseJson(ctx, *this)) return code;
+    Args args(argv, {"--encoding"}, {"--quote-all", "--header", "--filtered", "--slot-order", "--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
+    TextEncoding encoding;
+    if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE OUT");
     const std::string& out = args.positional()[1];
     if (out != "-" && !TextTargetAllowed(ctx, args, out, args.positional()[0])) return kExitFailed;
@@ -44,13 +50,11 @@ class ExportCsvCommand : public Command {
     options.fieldNumberOrder = args.has("--slot-order");
     CsvSettings settings;
     settings.alwaysQuote = options.quoteAll;
-    int result;
-    if (out == "-") {
-      Utf8StreamSink sink(ctx.out);
+    int result = 0;
+    Status written = WriteTextTo(ctx, out, encoding, [&](TextSink& sink) {
       result = ExportCsvTo(db, options, sink, settings, ctx.locale, ctx.ui);
-    } else {
-      result = ExportCsv(db, options, out, settings, ctx.locale, ctx.ui);
-    }
+    });
+    if (!written) return Failure(ctx, written.message());
     if (result != 1) return Failure(ctx, "Could not export every record to " + out);
     return kExitOk;
   }

@@ -1,11 +1,15 @@
 // filter FILE [...]: show the two filters, or set them as the "Edit
 // Filters" dialog's OK does.
+#include <charconv>
 #include <ostream>
+#include <utility>
 
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
+#include "cli/query.h"
+#include "cli/typed_value.h"
 #include "engine/value_text.h"
 #include "ops/database_settings.h"
 #include "ops/filter_dialog.h"
@@ -83,7 +87,7 @@ class FilterCommand : public Command {
         f.notChecked = args.has("--not" + k);
         if (!f.enabled) continue;
         std::string error;
-        if (!ReadCondition(ctx, db, *args.value("--filter" + k), f, error)) {
+        if (!ReadFilterCondition(ctx, db, *args.value("--filter" + k), f, error)) {
           return UsageError(ctx, *this, "--filter" + k + ": " + error);
         }
       }
@@ -99,26 +103,6 @@ class FilterCommand : public Command {
   }
 
  private:
-  // FIELD=VALUE; a field name may itself hold "=", so each "=" is tried
-  // until the text before it names a field.
-  static bool ReadCondition(const Context& ctx, const Database& db, const std::string& cond, FilterDialogFilter& f,
-                       std::string& error) {
-    for (size_t eq = cond.find('='); eq != std::string::npos; eq = cond.find('=', eq + 1)) {
-      const int field = ResolveField(db, cond.substr(0, eq));
-      if (field < 0) continue;
-      std::string value;
-      if (!ToStoredText(cond.substr(eq + 1), "the value of " + cond.substr(0, eq), value, error)) {
-        return false;
-      }
-      if (ReadFilterValueText(db, field, value, ctx.locale, f, error)) return true;
-      error = Cp1252ToUtf8(error);
-      return false;
-    }
-    error = cond.find('=') == std::string::npos ? "COND is FIELD=VALUE"
-                                                : "no field " + cond.substr(0, cond.find('='));
-    return false;
-  }
-
   // The values the filter's field type uses, as text.
   static std::string Describe(const Context& ctx, const Database& db, const FilterDialogFilter& f) {
     switch (FilterControlsFor(db.schema(), f.field)) {
@@ -143,6 +127,35 @@ class FilterCommand : public Command {
     return "(passes every record with a value slot)";
   }
 
+  // "low" and "high" of a range test, the same under any conventions.
+  static void WriteLimits(JsonWriter& j, const Database& db, const FilterDialogFilter& f) {
+    switch (FilterControlsFor(db.schema(), f.field)) {
+      case FilterControls::WholeLimits:
+      case FilterControls::DecimalLimits:
+        for (const auto& [key, text] : {std::pair{"low", &f.lowerLimit}, std::pair{"high", &f.upperLimit}}) {
+          double number = 0;
+          auto [ptr, ec] = std::from_chars(text->data(), text->data() + text->size(), number);
+          j.Key(key);
+          if (!text->empty() && ec == std::errc() && ptr == text->data() + text->size()) {
+            j.Double(number);
+          } else {
+            j.String(Cp1252ToUtf8(*text));
+          }
+        }
+        return;
+      case FilterControls::DateLimits:
+        j.Key("low").String(IsoDateText(f.lowerDay));
+        j.Key("high").String(IsoDateText(f.upperDay));
+        return;
+      case FilterControls::TimeLimits:
+        j.Key("low").String(ClockText(f.lowerTime.hours, f.lowerTime.minutes, f.lowerTime.seconds));
+        j.Key("high").String(ClockText(f.upperTime.hours, f.upperTime.minutes, f.upperTime.seconds));
+        return;
+      default:
+        return;
+    }
+  }
+
   static void Show(Context& ctx, const Database& db, const FilterDialogValues& v, size_t inView) {
     auto fieldName = [&](int field) {
       return field >= 0 && field < format::kFieldCount ? Cp1252ToUtf8(db.schema().field[field].name.str())
@@ -159,6 +172,7 @@ class FilterCommand : public Command {
         j.Key("slot").Number(f.field);
         j.Key("name").String(fieldName(f.field));
         j.Key("test").String(Describe(ctx, db, f));
+        WriteLimits(j, db, f);
         j.EndObject();
       }
       j.EndArray();

@@ -1,16 +1,28 @@
 // find FILE TEXT: "Search Database", then "Repeat the current Find" until
 // nothing more is found; every hit is printed.
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include <ostream>
 
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
+#include "cli/record_output.h"
 #include "ops/find.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {
 namespace {
+
+// A file nobody may write was made read-only on purpose; searching it
+// must still work, it only cannot keep the search settings.
+bool ReadOnlyFile(const std::string& path) {
+  struct stat st {};
+  if (::stat(path.c_str(), &st) != 0) return false;
+  return (st.st_mode & 0222) == 0 || ::access(path.c_str(), W_OK) != 0;
+}
 
 // What the search settings keep of the text (the dialog's box takes no
 // more); a longer text would be searched for in full once and cut after.
@@ -22,15 +34,17 @@ class FindCommand : public Command {
   std::string summary() const override { return "search the records in view for a text"; }
   std::string help() const override {
     return "Usage: cardovex-cli [--json] find FILE TEXT [--field F] [--case-sensitive]\n"
-           "                    [--begins-with]\n"
+           "                    [--begins-with] [--records]\n"
            "Stores the search settings in FILE as the Search Database dialog does and\n"
-           "saves it, searches from the first record, then repeats the find until\n"
+           "saves it (unless FILE is read-only), searches from the first record, then repeats the find until\n"
            "nothing more is found, and prints every hit in table order.\n"
            "  --field F          search only field F (slot number 0-29 or name);\n"
            "                     default \"Search All Fields\"\n"
            "  --case-sensitive   letters must match in case (otherwise A-Z match\n"
            "                     either case)\n"
            "  --begins-with      the field's text must begin with TEXT\n"
+           "  --records          print the records hit, as 'records' prints them,\n"
+           "                     instead of one line per hit\n"
            "Only the records in view (those that pass the filters) are searched, each\n"
            "field as the list shows it. Integer and Unique fields match only a TEXT of\n"
            "digits; a Check-Box matches \"1\" when checked and \"0\" when not.\n"
@@ -44,7 +58,7 @@ class FindCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--field"}, {"--case-sensitive", "--begins-with"});
+    Args args(argv, {"--field"}, {"--case-sensitive", "--begins-with", "--records"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TEXT");
     SearchSettings search;
@@ -75,8 +89,14 @@ class FindCommand : public Command {
          found = RepeatFind(session)) {
       hits.push_back(session.found);
     }
-    if (!SaveForCommand(ctx, db)) return kExitFailed;
-    Print(ctx, db, hits);
+    if (!ReadOnlyFile(db.path()) && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (args.has("--records")) {
+      std::vector<size_t> rows;
+      for (const FindHit& h : hits) rows.push_back(static_cast<size_t>(h.index));
+      WriteRecords(ctx, db, rows);
+    } else {
+      Print(ctx, db, hits);
+    }
     return hits.empty() ? kExitFailed : kExitOk;
   }
 

@@ -5,6 +5,8 @@
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
+#include "cli/text_files.h"
 #include "ops/csv_import.h"
 #include "platform/text_codec.h"
 
@@ -17,12 +19,17 @@ class ImportCsvCommand : public Command {
   std::string summary() const override { return "append the records of a CSV file"; }
   std::string help() const override {
     return "Usage: cardovex-cli [--password PW] import-csv FILE IN [--by-slot] [--strict]\n"
-           "Appends one record per line of IN (Windows-1252 text) after the existing\n"
-           "records and saves FILE. Column n goes to the nth used field of the display\n"
-           "order; there is no header line (a header would become a record).\n"
+           "                                                  [--header] [--encoding E]\n"
+           "Appends one record per line of IN (UTF-8 text, a byte-order mark allowed;\n"
+           "'-' reads standard input) after the existing records and saves FILE.\n"
+           "Column n goes to the nth used field of the display order.\n"
+           "  --header    the first line names the columns: it is skipped\n"
            "  --by-slot   column n goes to field slot n instead\n"
            "  --strict    refuse the whole file (importing nothing) when any value would\n"
-           "              not be stored as given\n"
+           "              not be stored as given\n" +
+           std::string(kEncodingHelp) +
+           "A UTF-8 file holding characters that Windows-1252 cannot hold is refused\n"
+           "(nothing is imported); stderr names them with their lines.\n"
            "Values convert by the field's type: dates and times through the date and\n"
            "time patterns of the global options (times keep hours and minutes), Pop-Up\n"
            "texts are found in the field's list or appended to it while it holds fewer\n"
@@ -36,25 +43,56 @@ class ImportCsvCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--by-slot", "--strict"});
+    Args args(argv, {"--encoding"}, {"--by-slot", "--strict", "--header"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE IN");
+    TextEncoding encoding;
+    if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
+    const std::string& in = args.positional()[1];
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     if (!PassAccessCheck(ctx, db, secured::kAddRecords)) return kExitFailed;
     const int mode = args.has("--by-slot") ? kCsvColumnsBySlot : kCsvColumnsByDisplayOrder;
-    CsvImportResult result = ImportCsvFile(db, args.positional()[1], mode, CsvSettings(),
-                                           ctx.locale, args.has("--strict"));
+    const bool strict = args.has("--strict"), header = args.has("--header");
+    CsvImportResult result;
+    if (encoding == TextEncoding::kWindows1252 && in != "-") {
+      // Read as it comes, without holding the whole file.
+      result = ImportCsvFile(db, in, mode, CsvSettings(), ctx.locale, strict, header);
+    } else {
+      std::string bytes;
+      if (Status s = ReadTextFrom(in, bytes); !s) return Failure(ctx, s.message());
+      NarrowedText text = NarrowText(bytes, encoding);
+      bytes = std::string();
+      if (!text.lossless()) return RefuseUnstorable(ctx, in, text);
+      result = ImportCsvText(db, std::move(text.bytes), TextFileName(in), mode, CsvSettings(),
+                             ctx.locale, strict, header);
+    }
     if (!result.issues.empty()) ReportIssues(ctx, db, result.issues);
     if (!result.status) return Failure(ctx, result.status.message());
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json) {
+      PrintCounts(ctx, {{"imported", static_cast<int64_t>(result.imported)},
+                        {"linesNotStoredAsGiven", static_cast<int64_t>(result.issues.lines)}});
+      return kExitOk;
+    }
     ctx.out << result.imported << (result.imported == 1 ? " record" : " records") << " imported\n";
     return kExitOk;
   }
 
  private:
   static void ReportIssues(Context& ctx, const Database& db, const CsvImportIssues& issues);
+  static int RefuseUnstorable(Context& ctx, const std::string& in, const NarrowedText& text);
 };
+
+int ImportCsvCommand::RefuseUnstorable(Context& ctx, const std::string& in, const NarrowedText& text) {
+  ctx.err << "import-csv: " << text.unstorableLines
+          << (text.unstorableLines == 1 ? " line holds" : " lines hold")
+          << " characters that a database cannot store";
+  ctx.err << (text.unstorableLines > NarrowedText::kKeptLines ? "; the first of them:\n" : ":\n");
+  for (const std::string& line : DescribeUnstorable(text)) ctx.err << "  " << line << "\n";
+  return Failure(ctx, "nothing was imported from " + TextFileName(in) +
+                          " (a file written in Windows-1252 needs --encoding windows-1252)");
+}
 
 void ImportCsvCommand::ReportIssues(Context& ctx, const Database& db, const CsvImportIssues& issues) {
   ctx.err << "import-csv: " << issues.lines << (issues.lines == 1 ? " line holds" : " lines hold")

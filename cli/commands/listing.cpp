@@ -3,6 +3,8 @@
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
+#include "cli/text_files.h"
 #include "design/link_access.h"
 #include "ops/linked_listing.h"
 
@@ -15,22 +17,27 @@ class ListingCommand : public Command {
   std::string summary() const override { return "write records as a \"name: value\" text listing"; }
   std::string help() const override {
     return "Usage: cardovex-cli [--password PW] listing FILE [--record N]\n"
-           "                                          [-o OUT [--force]]\n"
+           "                                          [-o OUT [--force]] [--encoding E]\n"
            "Writes the records in view (or record N, its index in table order) as the\n"
            "Export Record(s) command does: per record one \"NAME: VALUE\" line for each\n"
            "used field marked Export/Print, in display order, then 40 dashes. A Link\n"
            "field lists its linked records in its place, indented by three blanks per\n"
            "level. Lines end in LF.\n"
-           "  -o OUT   write to OUT (Windows-1252) instead of standard output (UTF-8);\n"
-           "           a FIFO or device is written into\n"
-           "  --force  write OUT even when it is a database or FILE itself\n";
+           "  -o OUT   write to OUT instead of standard output ('-'); a FIFO or\n"
+           "           device is written into\n"
+           "  --force  write OUT even when it is a database or FILE itself\n" +
+           std::string(kEncodingHelp);
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--record", "-o"}, {"--force"});
+    if (int code = RefuseJson(ctx, *this)) return code;
+    Args args(argv, {"--record", "-o", "--encoding"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
+    TextEncoding encoding;
+    if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
+    const std::string target = args.value("-o").value_or("-");
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
-    if (auto out = args.value("-o"); out && !TextTargetAllowed(ctx, args, *out, args.positional()[0])) {
+    if (target != "-" && !TextTargetAllowed(ctx, args, target, args.positional()[0])) {
       return kExitFailed;
     }
     Database db;
@@ -42,14 +49,10 @@ class ListingCommand : public Command {
     LinkServices services = SecuredLinkServices(ctx.ui, &ctx.locale);
     LinkedRecordsListing linked(services, ctx.locale);
     const ListingContext listing{ctx.locale, &linked};
-    if (auto out = args.value("-o")) {
-      if (Status s = WriteListingFile(db, all, current, *out, listing); !s) {
-        return Failure(ctx, s.message());
-      }
-      return kExitOk;
-    }
-    Utf8StreamSink sink(ctx.out);
-    WriteListing(db, all, current, sink, listing);
+    Status written = WriteTextTo(ctx, target, encoding, [&](TextSink& sink) {
+      WriteListing(db, all, current, sink, listing);
+    });
+    if (!written) return Failure(ctx, written.message());
     return kExitOk;
   }
 };

@@ -5,6 +5,7 @@
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/field_spec.h"
+#include "cli/json_output.h"
 #include "platform/file_io.h"
 #include "platform/text_codec.h"
 
@@ -30,6 +31,7 @@ class NewCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--name", "--field"}, {"--extension", "--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

@@ -2,6 +2,7 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/link_access.h"
 #include "ops/linked_listing.h"
 #include "ops/print.h"
@@ -27,6 +28,7 @@ class PrintCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--record", "--command", "--arg"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

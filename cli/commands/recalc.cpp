@@ -4,6 +4,7 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "ops/calc.h"
 
 namespace cx::cli {
@@ -23,6 +24,7 @@ class RecalcCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

@@ -5,6 +5,7 @@
 
 #include "cli/args.h"
 #include "cli/command.h"
+#include "cli/json_output.h"
 #include "design/receive_access.h"
 #include "infrared/receiver.h"
 #include "platform/data_folder.h"
@@ -43,6 +44,7 @@ class ReceiveCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--listen", "--count"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (!args.positional().empty()) return UsageError(ctx, *this, "unexpected argument");

@@ -1,10 +1,11 @@
 // records FILE: the value text of every field of the records in view (or
-// of all records), in table order.
+// of all records, one record, or the result of a query), in table order.
 #include <ostream>
 
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
+#include "cli/query.h"
 #include "cli/record_output.h"
 #include "ops/session.h"
 
@@ -16,26 +17,52 @@ class RecordsCommand : public Command {
   std::string name() const override { return "records"; }
   std::string summary() const override { return "list the records with every value as shown"; }
   std::string help() const override {
-    return "Usage: cardovex-cli [--json] records FILE [--all]\n"
+    return "Usage: cardovex-cli [--json] records FILE [--all | --record INDEX]\n"
+           "       cardovex-cli [--json] records FILE [--where COND]... [--sort KEY]...\n"
            "Lists the records in view (those that pass the database's filters) in\n"
            "table order, each field in display order, values as the list shows them\n"
            "with the date, time and decimal conventions of the global options.\n"
-           "  --all    every record, whatever the filters say\n"
+           "  --all            every record, whatever the filters say\n"
+           "  --record INDEX   the one record INDEX\n"
+           "  --where COND     only the records that meet COND, written as 'filter'\n"
+           "                   takes it (FIELD=VALUE); every COND given must hold, and\n"
+           "                   the database's own filters play no part\n"
+           "  --sort KEY       up to three keys, written as 'sort' takes them, the\n"
+           "                   first given first; records equal on every key stay in\n"
+           "                   table order\n"
+           "A query changes nothing: FILE is not written, so it also works on a file\n"
+           "that may only be read. The index printed is always the record's place in\n"
+           "FILE, the INDEX that 'edit' and 'delete --record' take.\n"
            "With --json: an array of {\"index\": N, \"fields\": [{\"slot\", \"name\",\n"
-           "\"text\"}]}, line breaks kept. Without: a tab-separated table with a\n"
-           "header row, line breaks shown as blanks.\n";
+           "\"text\", \"value\"}]}, line breaks kept; \"value\" is typed and the same\n"
+           "under any conventions (numbers, true/false, \"YYYY-MM-DD\", \"HH:MM:SS\",\n"
+           "null for no value). Without: a tab-separated table with a header row,\n"
+           "the index first, line breaks shown as blanks.\n";
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--all"});
+    Args args(argv, {"--record", "--where", "--sort"}, {"--all"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+    const bool query = args.has("--where") || args.has("--sort");
+    if (args.has("--all") + args.has("--record") + query > 1) {
+      return UsageError(ctx, *this, "--all, --record and a query go alone");
+    }
     Database db;
     DataSession session(db, ctx.locale, ctx.ui);
     if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
 
     std::vector<size_t> rows;
-    if (args.has("--all")) {
+    std::optional<size_t> record;
+    std::string error;
+    if (!RecordOption(args, db, record, error)) return UsageError(ctx, *this, error);
+    if (record) {
+      rows.push_back(*record);
+    } else if (query) {
+      if (!QueryRows(ctx, db, args.values("--where"), args.values("--sort"), rows, error)) {
+        return error.empty() ? kExitFailed : UsageError(ctx, *this, error);
+      }
+    } else if (args.has("--all")) {
       rows.resize(db.recordCount());
       for (size_t i = 0; i < rows.size(); ++i) rows[i] = i;
     } else {

@@ -5,6 +5,7 @@
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/properties.h"
 #include "platform/text_codec.h"
 
@@ -22,6 +23,7 @@ class RenameCommand : public Command {
   }
 
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE NAME");

@@ -3,6 +3,7 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 
 namespace cx::cli {
 namespace {
@@ -18,6 +19,7 @@ class ResaveCommand : public Command {
            "renamed over it.\n";
   }
   int Run(Context& ctx, const std::vector<std::string>& argv) override {
+    if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().empty() || args.positional().size() > 2) {

@@ -7,6 +7,7 @@
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
+#include "cli/json_output.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {
@@ -81,9 +82,9 @@ class SecurityCommand : public Command {
       JsonWriter j(ctx.out);
       j.BeginObject();
       for (int op = 0; op < secured::kCount; ++op) {
-        j.Key(std::string(OperationLabel(op))).String(std::string(AccessLevelLabel(s.levels[op])));
+        j.Key(CamelCaseKey(OperationLabel(op))).String(std::string(AccessLevelLabel(s.levels[op])));
       }
-      j.Key("password set").Bool(!s.password.empty());
+      j.Key("passwordSet").Bool(!s.password.empty());
       j.EndObject();
       j.Finish();
       return;

@@ -1,12 +1,14 @@
 // set-field FILE FIELD [settings]: the field editor from the command line,
 // type changes with their conversion questions included.
 #include <ostream>
+#include <set>
 
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
+#include "cli/json_output.h"
 #include "design/field_controls.h"
 #include "design/field_editor.h"
 #include "ops/field_values.h"
@@ -14,6 +16,10 @@
 
 namespace cx::cli {
 namespace {
+
+// Settings shown as numbers (the others are texts or yes/no).
+const std::set<std::string> kNumberRows = {"slot", "max-chars", "places", "pixels", "other-field",
+                                           "group"};
 
 // An entry of a list given by its label (case ignored) or its index.
 template <typename List>
@@ -95,9 +101,14 @@ class SetFieldCommand : public Command {
     if (!QuestionsAnswered(ctx)) return kExitFailed;
     if (out.result == ApplyResult::Declined) {
       ctx.err << "Field left unchanged.\n";
+      if (ctx.json) PrintChange(ctx, db, slot, before, false, 0);
       return kExitOk;
     }
     if (!SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json) {
+      PrintChange(ctx, db, slot, before, true, out.converted ? out.conversion.recordsRewritten : 0);
+      return kExitOk;
+    }
     ctx.out << "Field " << slot << " " << Cp1252ToUtf8(db.schema().field[slot].name.str());
     if (before.type() != db.schema().field[slot].type()) {
       ctx.out << ": " << FieldTypeLabel(before.type()) << " -> "
@@ -109,6 +120,21 @@ class SetFieldCommand : public Command {
   }
 
  private:
+  static void PrintChange(Context& ctx, const Database& db, int slot, const FieldDef& before, bool changed,
+                          size_t rewritten) {
+    const FieldDef& now = db.schema().field[slot];
+    JsonWriter j(ctx.out);
+    j.BeginObject();
+    j.Key("slot").Number(slot);
+    j.Key("name").String(Cp1252ToUtf8(now.name.str()));
+    j.Key("type").String(std::string(FieldTypeLabel(now.type())));
+    j.Key("previousType").String(std::string(FieldTypeLabel(before.type())));
+    j.Key("changed").Bool(changed);
+    j.Key("recordsRewritten").Number(static_cast<int64_t>(rewritten));
+    j.EndObject();
+    j.Finish();
+  }
+
   // Reads the options into the settings, as the dialog's controls would
   // hold them; false with `error` for a value that names nothing.
   static bool Collect(const Args& args, const Database& db, int slot, FieldSettings& s, bool& any,
@@ -271,7 +297,16 @@ class SetFieldCommand : public Command {
     if (ctx.json) {
       JsonWriter j(ctx.out);
       j.BeginObject();
-      for (const auto& [key, value] : rows) j.Key(key).String(value);
+      for (const auto& [key, value] : rows) {
+        j.Key(CamelCaseKey(key));
+        if (std::optional<long> n = ParseNumber(value); n && kNumberRows.count(key)) {
+          j.Number(*n);
+        } else if (value == "yes" || value == "no") {
+          j.Bool(value == "yes");
+        } else {
+          j.String(value);
+        }
+      }
       j.EndObject();
       j.Finish();
       return;

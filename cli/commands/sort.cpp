@@ -4,6 +4,7 @@
 #include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "ops/sort.h"
 #include "platform/text_codec.h"
 
@@ -57,6 +58,10 @@ class SortCommand : public Command {
     if (!AcceptSortingDialog(db, choice, ctx.ui)) return kExitFailed;
     SortAfterDialog(session);
     if (!SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json) {
+      PrintCounts(ctx, {{"sorted", static_cast<int64_t>(db.recordCount())}});
+      return kExitOk;
+    }
     ctx.out << db.recordCount() << (db.recordCount() == 1 ? " record" : " records") << " sorted\n";
     return kExitOk;
   }

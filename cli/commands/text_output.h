@@ -1,5 +1,5 @@
-// Output of the export, listing and report commands: the terminal gets
-// UTF-8, files keep the database's 8-bit Windows-1252 bytes.
+// Output of the export, listing and report commands: where it may go (the
+// encodings are cli/text_files.h's concern).
 #pragma once
 
 #include <ostream>

@@ -6,6 +6,7 @@
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
+#include "cli/json_output.h"
 #include "design/link_access.h"
 #include "ops/links.h"
 
@@ -41,7 +42,8 @@ class TransferCommand : public Command {
     Args args(argv, {"--record"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TARGET");
-    if (!LockDatabases(ctx, {args.positional()[0], args.positional()[1]})) return kExitFailed;
+    const std::string target = LocateDatabase(args.positional()[1]);
+    if (!LockDatabases(ctx, {LocateDatabase(args.positional()[0]), target})) return kExitFailed;
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     TransferWhich which;
@@ -56,9 +58,18 @@ class TransferCommand : public Command {
     }
     DataSession session(db, ctx.locale, ctx.ui);
     LinkServices services = SecuredLinkServices(ctx.ui, &ctx.locale);
-    TransferResult result = TransferRecordsTo(move_, which, session, args.positional()[1], services);
+    TransferResult result = TransferRecordsTo(move_, which, session, target, services);
     if (!result.done || result.failed) return kExitFailed;
     if (db.changed() && !SaveForCommand(ctx, db)) return kExitFailed;
+    if (ctx.json && move_) {
+      PrintCounts(ctx, {{"copied", static_cast<int64_t>(result.copied)},
+                        {"removed", static_cast<int64_t>(result.deleted)}});
+      return kExitOk;
+    }
+    if (ctx.json) {
+      PrintCounts(ctx, {{"copied", static_cast<int64_t>(result.copied)}});
+      return kExitOk;
+    }
     ctx.out << result.copied << (result.copied == 1 ? " record" : " records") << " copied";
     if (move_) ctx.out << ", " << result.deleted << " removed from " << args.positional()[0];
     ctx.out << "\n";

@@ -70,11 +70,27 @@ std::string TextsOf(const std::string& json) {
   std::string texts;
   for (size_t at = json.find("\"text\":"); at != std::string::npos; at = json.find("\"text\":", at + 1)) {
     size_t start = at + 8;
-    size_t end = json.find("\"}", start);
+    size_t end = json.find("\",\"value\":", start);
     texts += json.substr(start, end - start) + "|";
   }
   return texts;
 }
+
+std::string ValuesOf(const std::string& json) {
+  // The typed "value"s as JSON, in order.
+  std::string values;
+  for (size_t at = json.find("\"value\":"); at != std::string::npos; at = json.find("\"value\":", at + 1)) {
+    size_t start = at + 8;
+    values += json.substr(start, json.find('}', start) - start) + "|";
+  }
+  return values;
+}
+
+// Typed values read the same under any conventions: numbers with a point,
+// ISO dates, 24-hour times, null where the list shows no value.
+const char* const kEveryTypeValues =
+    "\"café\"|-42|3.14|\"Grün\"|true|7|null|\"2024-03-09\"|\"13:07:05\"|12|12|"
+    "\"line 1\\r\\nline 2\"|null|\"Ana\"|\"01:02:05\"|\"1905-01-01\"|2.5|";
 
 TEST(CliRecords, ShowsEveryTypeInUsConventions) {
   testing::TempDir dir;
@@ -84,8 +100,9 @@ TEST(CliRecords, ShowsEveryTypeInUsConventions) {
   ASSERT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(TextsOf(r.out),
             "café|-42|3.14|Grün|1|7||3/9/2024|1:07:05 PM|12|12|line 1\\r\\nline 2||Ana|1:02:05|1/1/1905|2,50|");
-  EXPECT_NE(r.out.find("{\"index\":0,\"fields\":[{\"slot\":0,\"name\":\"Text\",\"text\":\"café\"}"),
+  EXPECT_NE(r.out.find("{\"index\":0,\"fields\":[{\"slot\":0,\"name\":\"Text\",\"text\":\"café\","),
             std::string::npos);
+  EXPECT_EQ(ValuesOf(r.out), kEveryTypeValues);
 }
 
 TEST(CliRecords, ShowsEveryTypeInGermanConventions) {
@@ -96,6 +113,7 @@ TEST(CliRecords, ShowsEveryTypeInGermanConventions) {
   ASSERT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(TextsOf(r.out),
             "café|-42|3.14|Grün|1|7||09.03.2024|13:07:05|12|12|line 1\\r\\nline 2||Ana|1:02:05|01.01.1905|2,50|");
+  EXPECT_EQ(ValuesOf(r.out), kEveryTypeValues);
 }
 
 TEST(CliRecords, TableHasHeaderAndOneLineValues) {
@@ -108,7 +126,8 @@ TEST(CliRecords, TableHasHeaderAndOneLineValues) {
   std::getline(lines, header);
   std::getline(lines, row);
   EXPECT_FALSE(std::getline(lines, extra));
-  EXPECT_EQ(header.rfind("Text\tInt\tFloat\tPop", 0), 0u);
+  EXPECT_EQ(header.rfind("Index\tText\tInt\tFloat\tPop", 0), 0u);
+  EXPECT_EQ(row.rfind("0\tcafé\t-42", 0), 0u);
   EXPECT_NE(row.find("line 1  line 2"), std::string::npos);
 }
 

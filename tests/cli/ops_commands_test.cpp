@@ -156,11 +156,11 @@ TEST(CliSort, RefusedKeyShowsTheDialogMessageAndLeavesTheFile) {
   const Bytes before = FileBytes(path);
   Result image = Cli({"sort", path, "Qty", "Img"});
   EXPECT_EQ(image.code, 1);
-  EXPECT_EQ(image.err, "ERROR!: This type of field (Img) cannot currently be sorted!\n");
+  EXPECT_EQ(image.err, "cardovex-cli: sort: ERROR!: This type of field (Img) cannot currently be sorted!\n");
   Result relative = Cli({"sort", path, "Run"});
   EXPECT_EQ(relative.code, 1);
   EXPECT_EQ(relative.err,
-            "ERROR!: Since this field (Run) references other records, it's value is relative to "
+            "cardovex-cli: sort: ERROR!: Since this field (Run) references other records, it's value is relative to "
             "it's position, meaning that it cannot be the basis for a sort!\n");
   EXPECT_EQ(Cli({"sort", path, "Nope"}).code, 2);
   EXPECT_EQ(FileBytes(path), before);
@@ -204,7 +204,7 @@ TEST(CliFilter, ShowingAndBadSpecsLeaveTheFile) {
   Result shown = Cli({"--json", "filter", path});
   ASSERT_EQ(shown.code, 0) << shown.err;
   EXPECT_EQ(shown.out,
-            "{\"filters\":[{\"enabled\":true,\"not\":false,\"slot\":1,\"name\":\"Qty\",\"test\":\"6 to 12\"},"
+            "{\"filters\":[{\"enabled\":true,\"not\":false,\"slot\":1,\"name\":\"Qty\",\"test\":\"6 to 12\",\"low\":6,\"high\":12},"
             "{\"enabled\":true,\"not\":true,\"slot\":0,\"name\":\"Name\",\"test\":\"contains \\\"e\\\"\"}],"
             "\"combine\":\"AND\",\"inView\":1,\"records\":4}\n");
   for (std::vector<std::string> bad :
@@ -226,7 +226,7 @@ TEST(CliFind, ReportsEachRecordOnceWithItsFirstMatchingField) {
   // A search never starts at the last record: after the hit in record 2
   // nothing is left to search, although record 3 holds an "e" too.
   EXPECT_EQ(all.out, "[{\"index\":0,\"slot\":0},{\"index\":1,\"slot\":3},{\"index\":2,\"slot\":0}]\n");
-  EXPECT_EQ(all.err, "ERROR!: Not Found in Database!\n");
+  EXPECT_EQ(all.err, "cardovex-cli: find: ERROR!: Not Found in Database!\n");
   // Digits match Integer fields as numbers and dates as they are shown.
   Result digits = Cli({"find", path, "12"});
   EXPECT_EQ(digits.out, "1\t1\tQty\n3\t2\tDay\n");
@@ -248,7 +248,7 @@ TEST(CliFind, NothingFoundFailsAndTheSettingsAreSaved) {
   Result none = Cli({"--json", "find", path, "zzz", "--field", "Name", "--begins-with"});
   EXPECT_EQ(none.code, 1);
   EXPECT_EQ(none.out, "[]\n");
-  EXPECT_EQ(none.err, "ERROR!: Not Found in Database!\n");
+  EXPECT_EQ(none.err, "{\"error\":\"cardovex-cli: find: ERROR!: Not Found in Database!\",\"exitCode\":1}\n");
   Database db;
   testing::ScriptedUi ui;
   ASSERT_TRUE(db.Open(path, ui).ok());
@@ -363,8 +363,8 @@ TEST(CliPrint, RunsTheCommandAndReportsItsExitCode) {
   Result missing = Cli({"print", path, "--command", dir.File("no-such-program")});
   EXPECT_EQ(missing.code, 1);
   EXPECT_EQ(missing.err,
-            "ERROR: Unable to call PrintPocketCE.  Please check to see if it is properly installed.\n"
-            "ERROR: File not found\n");
+            "cardovex-cli: print: ERROR: Unable to call PrintPocketCE.  Please check to see if it is "
+            "properly installed.\ncardovex-cli: print: ERROR: File not found\n");
   EXPECT_FALSE(FileExists(temp));
 }
 

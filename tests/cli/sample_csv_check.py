@@ -31,7 +31,7 @@ def main(cli, folder):
         for options in EXPORTS:
             out = os.path.join(folder, name + ".check.csv")
             run(cli, ["export-csv", path, out] + options)
-            with open(out, newline="", encoding="cp1252") as f:
+            with open(out, newline="", encoding="utf-8") as f:
                 rows = list(csv.reader(f))
             os.remove(out)
             if "--header" in options:

@@ -232,7 +232,7 @@ class DataDialogsTest : public QObject {
     RunCli({"filter", QString::fromStdString(src), "--filter1", "Favorite=1"});
     const std::string cliOut = dir.File("cli.csv"), ourOut = dir.File("ours.csv"), utf8Out = dir.File("utf8.csv");
     RunCli({"export-csv", QString::fromStdString(src), QString::fromStdString(cliOut), "--header", "--quote-all",
-            "--filtered", "--slot-order"});
+            "--filtered", "--slot-order", "--encoding", "windows-1252"});
     Open c(src);
     gui::DataTarget target = c.Target();
     for (const std::string& path : {ourOut, utf8Out}) {

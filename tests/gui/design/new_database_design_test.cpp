@@ -67,11 +67,11 @@ class NewDatabaseDesignTest : public QObject {
     ui.fileAnswers = {contacts.toStdString()};
     const std::vector<FieldPlan> plan = {
         {0, "Name", FieldType::Text, [](QWidget* e) { Set(e, "maxCharacters", "30"); },
-         {{"max-chars", "30"}}},
+         {{"maxChars", 30}}},
         {1, "Qty", FieldType::Integer, [](QWidget* e) { Set(e, "pixelsShown", "45"); },
-         {{"pixels", "45"}}},
+         {{"pixels", 45}}},
         {2, "Price", FieldType::Float, [](QWidget* e) { Pick(e, "places", 2); },
-         {{"places", "2"}}},
+         {{"places", 2}}},
         {3, "Colour", FieldType::PopUp,
          [](QWidget* e) {
            OnModal("popupListDialog", [](QWidget* list) {
@@ -92,7 +92,7 @@ class NewDatabaseDesignTest : public QObject {
         {5, "Id", FieldType::Unique, nullptr, {{"type", "Unique"}}},
         {6, "Photo", FieldType::Image,
          [](QWidget* e) { e->findChild<QCheckBox*>("visible")->setChecked(false); },
-         {{"visible", "no"}}},
+         {{"visible", false}}},
         {7, "When", FieldType::Date, [](QWidget* e) { Pick(e, "dateBehavior", 1); },
          {{"behavior", "Date Record Added"}}},
         {8, "At", FieldType::Time, [](QWidget* e) { Pick(e, "timeBehavior", 2); },
@@ -103,16 +103,16 @@ class NewDatabaseDesignTest : public QObject {
            Set(e, "otherField", "7");
            Pick(e, "showValueFrom", 1);
          },
-         {{"other-db", "Contacts"}, {"other-field", "7"}, {"show-value-from", "Name"}}},
+         {{"otherDb", "Contacts"}, {"otherField", 7}, {"showValueFrom", "Name"}}},
         {10, "Owner", FieldType::Linked,
          [](QWidget* e) {
            Set(e, "otherDatabase", "Orders");
            Set(e, "otherField", "3");
          },
-         {{"other-db", "Orders"}, {"other-field", "3"}}},
+         {{"otherDb", "Orders"}, {"otherField", 3}}},
         {11, "About", FieldType::Note,
          [](QWidget* e) { e->findChild<QCheckBox*>("popupsAppend")->setChecked(true); },
-         {{"popups-append", "yes"}}},
+         {{"popupsAppend", true}}},
         {12, "Section", FieldType::Heading, nullptr, {{"type", "Heading"}}},
         {13, "Ship to", FieldType::DBPopup,
          [](QWidget* e) {
@@ -121,7 +121,7 @@ class NewDatabaseDesignTest : public QObject {
            Set(e, "group", "2");
            Set(e, "maxCharacters", "25");
          },
-         {{"other-db", "Contacts"}, {"group", "2"}, {"max-chars", "25"}}},
+         {{"otherDb", "Contacts"}, {"group", 2}, {"maxChars", 25}}},
         {14, "Running", FieldType::Calculated,
          [](QWidget* e) {
            Pick(e, "value1", 15);  // itself, from the previous record
@@ -130,8 +130,8 @@ class NewDatabaseDesignTest : public QObject {
            Pick(e, "value2", 2);  // Qty
            Pick(e, "resultFormat", 1);
          },
-         {{"value1", "Running"}, {"prev1", "yes"}, {"operation", "+"}, {"value2", "Qty"},
-          {"prev2", "no"}, {"result-format", "Integer"}}},
+         {{"value1", "Running"}, {"prev1", true}, {"operation", "+"}, {"value2", "Qty"},
+          {"prev2", false}, {"resultFormat", "Integer"}}},
     };
 
     EditDatabaseDialog dialog(doc.session());

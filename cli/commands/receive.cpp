@@ -29,7 +29,7 @@ class ReceiveCommand : public Command {
   std::string help() const override {
     return "Usage: cardovex-cli [--yes] [--password PW] receive [--listen HOST:PORT] [--count N]\n"
            "Listens for OBEX transfers over TCP (default: the ReceiveAddress setting, else\n"
-           "0.0.0.0:650; ports below 1024 need root) and stores what arrives in the data\n"
+           "0.0.0.0:6500, which needs no privileges) and stores what arrives in the data\n"
            "folder: a database is stored after asking (an existing one is replaced only\n"
            "when that is answered Yes), records are inserted into the database of the\n"
            "same name, which must be present. --yes answers every question Yes; without\n"

@@ -61,6 +61,8 @@ size_t FirstSpecial(std::string_view text, char separator) {
   return std::string_view::npos;
 }
 
+constexpr size_t kWriteBlock = size_t{1} << 16;
+
 bool IsNotUsed(const Schema& schema, int slot) {
   return slot >= format::kFieldCount || schema.field[slot].type() == FieldType::NotUsed;
 }
@@ -80,9 +82,16 @@ void QuoteCsvValue(std::string_view text, std::string& out, bool quoteAll, char 
   if (!quotes) {
     out.append(text);
   } else {
-    for (char c : text) {
-      if (c == csv::kQuote) out.push_back(csv::kQuote);
-      out.push_back(c);
+    // Runs up to and including each quote, then the quote once more.
+    size_t from = 0;
+    for (;;) {
+      const void* quote = std::memchr(text.data() + from, csv::kQuote, text.size() - from);
+      const size_t to = quote ? static_cast<size_t>(static_cast<const char*>(quote) - text.data()) + 1
+                              : text.size();
+      out.append(text.data() + from, to - from);
+      if (!quote) break;
+      out.push_back(csv::kQuote);
+      from = to;
     }
   }
   if (wrap) out.push_back(csv::kQuote);
@@ -94,7 +103,7 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
   const Schema& schema = db.schema();
   const ValueTextWriter values(ValueContext{schema, db.popups(), locale});
   int result = 1;
-  std::string line;
+  std::string pending;  // whole lines not yet written
   std::string text;
 
   if (options.withHeader) {
@@ -105,12 +114,13 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
     for (int pos = 0; pos < format::kFieldCount; ++pos) {
       int slot = schema.fieldOrder[pos];
       if (IsNotUsed(schema, slot)) continue;
-      if (!first) line.push_back(settings.separator);
+      if (!first) pending.push_back(settings.separator);
       first = false;
-      QuoteCsvValue(schema.field[slot].name.str(), line, settings.alwaysQuote, settings.separator);
+      QuoteCsvValue(schema.field[slot].name.str(), pending, settings.alwaysQuote, settings.separator);
     }
-    line.push_back(csv::kLineEnd);
-    out.Write(line);
+    pending.push_back(csv::kLineEnd);
+    out.Write(pending);
+    pending.clear();
   }
 
   std::optional<ViewTester> view;
@@ -128,22 +138,35 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
       result = 0;
       continue;
     }
-    line.clear();
     const auto fieldValues = FieldValues(record);
     for (int pos = 0; pos < format::kFieldCount; ++pos) {
       int slot = SlotAt(schema, pos, options.fieldNumberOrder);
       if (IsNotUsed(schema, slot)) continue;
-      if (pos != 0) line.push_back(settings.separator);
+      if (pos != 0) pending.push_back(settings.separator);
       if (schema.field[slot].type() == FieldType::Image) continue;
-      text.clear();
-      values.Append(slot, fieldValues[slot], text);
-      if (text.size() > csv::kMaxValueText) text.resize(csv::kMaxValueText);
-      QuoteCsvValue(text.empty() ? std::string_view("No Value") : std::string_view(text), line,
-                    options.quoteAll, settings.separator);
+      // Most values need no quotes: they are formatted in place and only
+      // the rare one that does is taken out again and quoted.
+      const size_t start = pending.size();
+      values.Append(slot, fieldValues[slot], pending);
+      if (pending.size() - start > csv::kMaxValueText) pending.resize(start + csv::kMaxValueText);
+      const std::string_view value(pending.data() + start, pending.size() - start);
+      if (value.empty()) {
+        QuoteCsvValue("No Value", pending, options.quoteAll, settings.separator);
+      } else if (options.quoteAll || FirstSpecial(value, settings.separator) != std::string_view::npos) {
+        text.assign(value);
+        pending.resize(start);
+        QuoteCsvValue(text, pending, options.quoteAll, settings.separator);
+      }
     }
-    line.push_back(csv::kLineEnd);
-    if (!out.Write(line)) result = 0;
+    pending.push_back(csv::kLineEnd);
+    // Lines go out in blocks: one write per line would copy every byte
+    // once more into the sink's own buffer.
+    if (pending.size() >= kWriteBlock) {
+      if (!out.Write(pending)) result = 0;
+      pending.clear();
+    }
   }
+  if (!pending.empty() && !out.Write(pending)) result = 0;
   return result;
 }
 

@@ -59,9 +59,13 @@ size_t PopupList::EncodedSize() const {
 }
 
 std::string PopupText(const PopupList& list, int itemIndex) {
+  return std::string(PopupTextView(list, itemIndex));
+}
+
+std::string_view PopupTextView(const PopupList& list, int itemIndex) {
   if (itemIndex == format::kNoPopupValue || itemIndex == -1) return "No Value";
-  if (itemIndex < 0 || static_cast<size_t>(itemIndex) >= list.items.size()) return "";
-  return list.items[itemIndex].substr(0, format::kMaxPopupText);
+  if (itemIndex < 0 || static_cast<size_t>(itemIndex) >= list.items.size()) return {};
+  return std::string_view(list.items[itemIndex]).substr(0, format::kMaxPopupText);
 }
 
 int PopupItemText(const std::string& databasePath, int fieldSlot, int itemIndex,

@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <span>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "engine/format.h"
@@ -49,6 +50,9 @@ PopupList DecodePopupList(std::span<const uint8_t> record, uint8_t attributes, u
 // The text of item `itemIndex` of list `list`, cut to 79 characters; 255
 // (or -1) is "No Value", an index past the end gives an empty text.
 std::string PopupText(const PopupList& list, int itemIndex);
+// The same text as a view into `list` (or a constant), valid while the
+// list is unchanged.
+std::string_view PopupTextView(const PopupList& list, int itemIndex);
 
 // PopupItemText: reads the list of `fieldSlot` from a database file that is
 // not loaded. 0 when the item was found (or is "No Value"), -1 otherwise

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstring>
 #include <filesystem>
 
 #include "engine/byte_order.h"
@@ -11,14 +12,36 @@ namespace cx {
 
 DataRecord::DataRecord(Bytes bytes, uint8_t attributes, uint32_t uniqueID)
     : attributes_(attributes), uniqueID_(uniqueID) {
-  SetBytes(std::move(bytes));
+  SetBytes(ByteView(bytes));
 }
 
-void DataRecord::SetBytes(Bytes bytes) {
-  auto block = std::make_shared<const Bytes>(std::move(bytes));
-  data_ = block->data();
-  size_ = static_cast<uint32_t>(block->size());
+void DataRecord::SetBytes(Bytes bytes) { SetBytes(ByteView(bytes)); }
+
+void DataRecord::SetBytes(ByteView bytes) {
+  std::shared_ptr<uint8_t[]> block = std::make_shared_for_overwrite<uint8_t[]>(bytes.size());
+  if (!bytes.empty()) std::memcpy(block.get(), bytes.data(), bytes.size());
+  data_ = block.get();
+  size_ = static_cast<uint32_t>(bytes.size());
   owned_ = std::move(block);
+}
+
+void DataRecord::SetBytes(std::shared_ptr<const uint8_t[]> owner, ByteView bytes) {
+  data_ = bytes.data();
+  size_ = static_cast<uint32_t>(bytes.size());
+  owned_ = std::move(owner);
+}
+
+std::pair<std::shared_ptr<const uint8_t[]>, ByteView> RecordArena::Copy(ByteView bytes) {
+  if (!block_ || used_ + bytes.size() > size_) {
+    size_ = block_ ? std::min(size_ * 2, kLargestBlock) : kFirstBlock;
+    size_ = std::max(size_, bytes.size());
+    block_ = std::make_shared_for_overwrite<uint8_t[]>(size_);
+    used_ = 0;
+  }
+  uint8_t* at = block_.get() + used_;
+  if (!bytes.empty()) std::memcpy(at, bytes.data(), bytes.size());
+  used_ += bytes.size();
+  return {block_, ByteView(at, bytes.size())};
 }
 
 namespace {
@@ -324,9 +347,18 @@ bool Database::AppendRecord(Bytes stored, uint8_t attributes, uint32_t uniqueID)
   return InsertRecord(records_.size(), std::move(stored), attributes, uniqueID);
 }
 
-void Database::ReplaceRecord(size_t index, Bytes stored) {
+void Database::ReplaceRecord(size_t index, Bytes stored) { ReplaceRecord(index, ByteView(stored)); }
+
+void Database::ReplaceRecord(size_t index, ByteView stored) {
   KeepAbove(nextUnique_, schema_, stored);
-  records_[index].SetBytes(std::move(stored));
+  records_[index].SetBytes(stored);
+  changed_ = true;
+}
+
+void Database::ReplaceRecord(size_t index, ByteView stored, RecordArena& arena) {
+  KeepAbove(nextUnique_, schema_, stored);
+  auto [owner, copy] = arena.Copy(stored);
+  records_[index].SetBytes(std::move(owner), copy);
   changed_ = true;
 }
 

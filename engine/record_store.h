@@ -35,13 +35,37 @@ class DataRecord {
   uint8_t attributes() const { return attributes_; }
   uint32_t uniqueID() const { return uniqueID_; }
   void SetBytes(Bytes bytes);
+  // The same from bytes the caller keeps (copied into one block).
+  void SetBytes(ByteView bytes);
+  // Bytes that `owner` keeps alive (a block shared with other records).
+  void SetBytes(std::shared_ptr<const uint8_t[]> owner, ByteView bytes);
 
  private:
   const uint8_t* data_ = nullptr;
   uint32_t size_ = 0;
   uint8_t attributes_ = 0;
   uint32_t uniqueID_ = 0;
-  std::shared_ptr<const Bytes> owned_;
+  // One allocation per replaced record: a recalculation after a sort
+  // replaces nearly every record of the file.
+  std::shared_ptr<const uint8_t[]> owned_;
+};
+
+// Room for many records replaced in one go (a recalculation of the whole
+// file): the copies share blocks, so that neither making them nor freeing
+// them costs an allocation each. A block lives as long as one record still
+// uses it; blocks start small and grow, so that a pass that replaces only a
+// record or two keeps little more than those alive.
+class RecordArena {
+ public:
+  // A copy of `bytes` and the block that holds it.
+  std::pair<std::shared_ptr<const uint8_t[]>, ByteView> Copy(ByteView bytes);
+
+ private:
+  static constexpr size_t kFirstBlock = size_t{8} << 10;
+  static constexpr size_t kLargestBlock = size_t{1} << 20;
+  std::shared_ptr<uint8_t[]> block_;
+  size_t size_ = 0;
+  size_t used_ = 0;
 };
 
 // What a database file holds before its data records. Commands that show
@@ -120,6 +144,9 @@ class Database {
   bool InsertRecord(size_t position, Bytes stored, uint8_t attributes = 0, uint32_t uniqueID = 0);
   bool AppendRecord(Bytes stored, uint8_t attributes = 0, uint32_t uniqueID = 0);
   void ReplaceRecord(size_t index, Bytes stored);
+  void ReplaceRecord(size_t index, ByteView stored);
+  // The same with the copy made in `arena`.
+  void ReplaceRecord(size_t index, ByteView stored, RecordArena& arena);
   void DeleteRecord(size_t index);
   void MoveRecord(size_t from, size_t to);
 

@@ -4,6 +4,7 @@
 #include <charconv>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <vector>
 
 #include "engine/dates.h"
@@ -53,60 +54,117 @@ void AppendNumber(std::string& out, long value, int digits) {
   while (n) out.push_back(buf[--n]);
 }
 
-}  // namespace
+using Layout = ValueTextWriter::Layout;
+using Part = Layout::Part;
 
-std::string DateText(uint32_t dayNumber, const LocaleInfo& locale) {
-  CalendarDate d = DayNumberToDate(dayNumber);
-  if (d.month <= 1 && d.day <= 1 && d.year <= 1904) return "NO DATE";
+Layout DateLayout(const LocaleInfo& locale) {
+  Layout layout;
+  layout.separator = locale.dateSeparator;
   PatternTokens tokens = Tokens(locale.shortDate, locale.dateSeparator);
-  std::string out;
+  layout.count = tokens.count;
   for (size_t i = 0; i < tokens.count; ++i) {
-    if (i > 0) out.push_back(locale.dateSeparator);
     std::string_view t = tokens.token[i];
+    Part& part = layout.part[i];
     if (EqualsIgnoringCase(t, "m")) {
-      AppendNumber(out, d.month, 1);
+      part = Part::Month;
     } else if (EqualsIgnoringCase(t, "mm") || EqualsIgnoringCase(t, "mmm")) {
-      AppendNumber(out, d.month, 2);  // a number even for "mmm"
+      part = Part::Month2;  // a number even for "mmm"
     } else if (EqualsIgnoringCase(t, "d")) {
-      AppendNumber(out, d.day, 1);
+      part = Part::Day;
     } else if (EqualsIgnoringCase(t, "dd")) {
-      AppendNumber(out, d.day, 2);
+      part = Part::Day2;
     } else if (EqualsIgnoringCase(t, "yy")) {
-      AppendNumber(out, d.year % 100, 2);
+      part = Part::Year2;
     } else if (EqualsIgnoringCase(t, "yyyy")) {
-      AppendNumber(out, d.year, 4);
+      part = Part::Year4;
     }
   }
-  return out;
+  return layout;
 }
 
-std::string TimeText(uint8_t seconds, uint8_t minutes, uint8_t hours, const LocaleInfo& locale) {
-  if (hours == format::kNoTimeHours) return "No Time";
-  const bool twelve = locale.timeFormat.find("tt") != std::string::npos;
-  const long h12 = hours == 0 ? 12 : (hours > 12 ? hours - 12 : hours);
+Layout TimeLayout(const LocaleInfo& locale) {
+  Layout layout;
+  layout.separator = locale.timeSeparator;
+  layout.twelveHour = locale.timeFormat.find("tt") != std::string::npos;
   PatternTokens tokens = Tokens(locale.timeFormat, locale.timeSeparator);
-  std::string out;
+  layout.count = tokens.count;
   for (size_t i = 0; i < tokens.count; ++i) {
-    if (i > 0) out.push_back(locale.timeSeparator);
     std::string_view t = tokens.token[i];
+    Part& part = layout.part[i];
     if (t == "h") {
-      AppendNumber(out, twelve ? h12 : (hours == 0 ? 12 : long(hours)), 1);
+      part = Part::Hour12;
     } else if (t == "hh") {
-      AppendNumber(out, twelve ? h12 : long(hours), 2);
+      part = Part::Hour12Two;
     } else if (t == "H") {
-      AppendNumber(out, hours, 1);
+      part = Part::Hour;
     } else if (t == "HH") {
-      AppendNumber(out, hours, 2);
+      part = Part::Hour2;
     } else if (t == "mm") {
-      AppendNumber(out, minutes, 2);
+      part = Part::Minute2;
     } else if (t.find("ss") != std::string_view::npos) {
-      AppendNumber(out, seconds, 2);
+      part = Part::Second2;
+    }
+  }
+  return layout;
+}
+
+void AppendDate(uint32_t dayNumber, const Layout& layout, std::string& out) {
+  CalendarDate d = DayNumberToDate(dayNumber);
+  if (d.month <= 1 && d.day <= 1 && d.year <= 1904) {
+    out += "NO DATE";
+    return;
+  }
+  for (size_t i = 0; i < layout.count; ++i) {
+    if (i > 0) out.push_back(layout.separator);
+    switch (layout.part[i]) {
+      case Part::Month: AppendNumber(out, d.month, 1); break;
+      case Part::Month2: AppendNumber(out, d.month, 2); break;
+      case Part::Day: AppendNumber(out, d.day, 1); break;
+      case Part::Day2: AppendNumber(out, d.day, 2); break;
+      case Part::Year2: AppendNumber(out, d.year % 100, 2); break;
+      case Part::Year4: AppendNumber(out, d.year, 4); break;
+      default: break;
+    }
+  }
+}
+
+void AppendTime(uint8_t seconds, uint8_t minutes, uint8_t hours, const Layout& layout,
+                const LocaleInfo& locale, std::string& out) {
+  if (hours == format::kNoTimeHours) {
+    out += "No Time";
+    return;
+  }
+  const bool twelve = layout.twelveHour;
+  const long h12 = hours == 0 ? 12 : (hours > 12 ? hours - 12 : hours);
+  for (size_t i = 0; i < layout.count; ++i) {
+    if (i > 0) out.push_back(layout.separator);
+    switch (layout.part[i]) {
+      case Part::Hour12: AppendNumber(out, twelve ? h12 : (hours == 0 ? 12 : long(hours)), 1); break;
+      case Part::Hour12Two: AppendNumber(out, twelve ? h12 : long(hours), 2); break;
+      case Part::Hour: AppendNumber(out, hours, 1); break;
+      case Part::Hour2: AppendNumber(out, hours, 2); break;
+      case Part::Minute2: AppendNumber(out, minutes, 2); break;
+      case Part::Second2: AppendNumber(out, seconds, 2); break;
+      default: break;
     }
   }
   if (twelve) {
     out.push_back(' ');
     out += hours < 12 ? locale.am : locale.pm;
   }
+}
+
+}  // namespace
+
+std::string DateText(uint32_t dayNumber, const LocaleInfo& locale) {
+  std::string out;
+  AppendDate(dayNumber, DateLayout(locale), out);
+  return out;
+}
+
+std::string TimeText(uint8_t seconds, uint8_t minutes, uint8_t hours, const LocaleInfo& locale) {
+  std::string out;
+  AppendTime(seconds, minutes, hours, TimeLayout(locale), locale, out);
   return out;
 }
 
@@ -156,52 +214,106 @@ std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot) {
   return ValueTextOf(ctx, fieldSlot, FieldValue(record, fieldSlot));
 }
 
-std::string ValueTextOf(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value) {
-  if (fieldSlot < 0 || fieldSlot >= format::kFieldCount) return "";
+namespace {
+
+// The one formatter behind ValueTextOf and ValueTextWriter; a layout not
+// given is read from the locale when a value needs it.
+void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value,
+                     const Layout* date, const Layout* time, std::string& out) {
+  if (fieldSlot < 0 || fieldSlot >= format::kFieldCount) return;
   const FieldDef& field = ctx.schema.field[fieldSlot];
-  if (!value) return field.type() == FieldType::Calculated ? "Error!" : "";
+  if (!value) {
+    if (field.type() == FieldType::Calculated) out += "Error!";
+    return;
+  }
+  auto appendStored = [&out](ByteView v) {
+    const char* p = reinterpret_cast<const char*>(v.data());
+    const void* nul = v.empty() ? nullptr : std::memchr(p, 0, v.size());
+    out.append(p, nul ? static_cast<const char*>(nul) - p : v.size());
+  };
+  auto appendDate = [&](uint32_t dayNumber) {
+    if (date) {
+      AppendDate(dayNumber, *date, out);
+    } else {
+      AppendDate(dayNumber, DateLayout(ctx.locale), out);
+    }
+  };
   switch (field.type()) {
     case FieldType::NotUsed:
     case FieldType::Image:
     case FieldType::Heading:
-      return "";
+      return;
     case FieldType::Text:
     case FieldType::Float:
     case FieldType::Note:
     case FieldType::DBPopup:
-      return ValueString(*value);
+      appendStored(*value);
+      return;
     case FieldType::Integer:
     case FieldType::Unique:
     case FieldType::Link:
-    case FieldType::Linked:
-      return std::to_string(static_cast<int32_t>(ValueNumber(*value)));
+    case FieldType::Linked: {
+      char buf[16];
+      auto r = std::to_chars(buf, buf + sizeof buf, static_cast<int32_t>(ValueNumber(*value)));
+      out.append(buf, r.ptr);
+      return;
+    }
     case FieldType::PopUp:
-      return PopupText(ctx.popups[fieldSlot], value->empty() ? 0 : (*value)[0]);
+      out += PopupTextView(ctx.popups[fieldSlot], value->empty() ? 0 : (*value)[0]);
+      return;
     case FieldType::CheckBox:
-      return !value->empty() && (*value)[0] != 0 ? "1" : "0";
+      out.push_back(!value->empty() && (*value)[0] != 0 ? '1' : '0');
+      return;
     case FieldType::Date:
-      return DateText(ValueNumber(*value), ctx.locale);
+      appendDate(ValueNumber(*value));
+      return;
     case FieldType::Time: {
       uint8_t b[4] = {0, 0, 0, 0};
       for (size_t i = 0; i < value->size() && i < 4; ++i) b[i] = (*value)[i];
-      return TimeText(b[0], b[1], b[2], ctx.locale);
+      if (time) {
+        AppendTime(b[0], b[1], b[2], *time, ctx.locale, out);
+      } else {
+        AppendTime(b[0], b[1], b[2], TimeLayout(ctx.locale), ctx.locale, out);
+      }
+      return;
     }
     case FieldType::Calculated: {
-      std::string stored = ValueString(*value);
       switch (field.resultFormat()) {
         case 0: case 1: case 4: case 5: case 6:
-          return stored;
+          appendStored(*value);
+          return;
         case 2:
-          return SecondsText(std::strtol(stored.c_str(), nullptr, 10));
-        case 3:
-          return DateText(static_cast<uint32_t>(std::strtol(stored.c_str(), nullptr, 10)),
-                          ctx.locale);
+        case 3: {
+          const std::string stored = ValueString(*value);
+          const long number = std::strtol(stored.c_str(), nullptr, 10);
+          if (field.resultFormat() == 2) {
+            out += SecondsText(number);
+          } else {
+            appendDate(static_cast<uint32_t>(number));
+          }
+          return;
+        }
         default:
-          return "Error!";
+          out += "Error!";
+          return;
       }
     }
   }
-  return "";
+}
+
+}  // namespace
+
+std::string ValueTextOf(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value) {
+  std::string out;
+  AppendValueText(ctx, fieldSlot, value, nullptr, nullptr, out);
+  return out;
+}
+
+ValueTextWriter::ValueTextWriter(const ValueContext& ctx)
+    : ctx_(ctx), date_(DateLayout(ctx.locale)), time_(TimeLayout(ctx.locale)) {}
+
+void ValueTextWriter::Append(int fieldSlot, std::optional<ByteView> value, std::string& out) const {
+  AppendValueText(ctx_, fieldSlot, value, &date_, &time_, out);
 }
 
 std::string OneLine(const std::string& text) {

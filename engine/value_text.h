@@ -27,6 +27,31 @@ std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot);
 // FieldValues); nothing stands for a slot the record does not contain.
 std::string ValueTextOf(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value);
 
+// ValueTextOf for loops over many values: the date and time patterns are
+// read once, and each text is appended to a buffer the caller reuses, so
+// that exporting a large database allocates nothing per value.
+class ValueTextWriter {
+ public:
+  explicit ValueTextWriter(const ValueContext& ctx);
+  // Appends exactly what ValueTextOf(ctx, fieldSlot, value) returns.
+  void Append(int fieldSlot, std::optional<ByteView> value, std::string& out) const;
+
+  // A short date or time pattern cut into its parts.
+  struct Layout {
+    enum class Part : uint8_t { None, Month, Month2, Day, Day2, Year2, Year4,
+                                Hour12, Hour12Two, Hour, Hour2, Minute2, Second2 };
+    Part part[3] = {Part::None, Part::None, Part::None};
+    size_t count = 0;
+    char separator = '/';
+    bool twelveHour = false;
+  };
+
+ private:
+  const ValueContext ctx_;
+  Layout date_;
+  Layout time_;
+};
+
 // "NO DATE" for day 0, else the date in the short date pattern's order.
 std::string DateText(uint32_t dayNumber, const LocaleInfo& locale);
 // "No Time" when the hours byte is 255.

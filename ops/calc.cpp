@@ -16,12 +16,18 @@ namespace {
 // NUL: a result never keeps more characters than this.
 constexpr size_t kResultChars = 14;
 
+// How many records ahead a walk over the file asks memory for.
+constexpr size_t kPrefetchRecords = 2;
+
 // What one pass needs besides the session: the view test prepared once and
 // the fields to evaluate, in display order.
 struct Pass {
   DataSession& session;
   ViewTester tester;
   std::vector<int> fields;
+  // The record being worked on, kept between records so that a walk over
+  // the whole file does not allocate for each one.
+  mutable Bytes work;
 
   Pass(DataSession& s, bool onlyPrevRecordFields) : session(s), tester(s.db, s.Link()) {
     const Schema& schema = s.db.schema();
@@ -47,12 +53,20 @@ void StoreSlotText(Bytes& record, int field, std::string_view text, const Schema
   }
   const size_t start = static_cast<size_t>(at) - 2;
   const size_t oldEnd = std::min(record.size(), static_cast<size_t>(at) + GetLE16(record.data() + start));
-  Bytes value(2 + text.size() + 1, 0);
-  PutLE16(value.data(), static_cast<uint16_t>(text.size() + 1));
-  std::copy(text.begin(), text.end(), value.begin() + 2);
-  record.erase(record.begin() + static_cast<std::ptrdiff_t>(start),
-               record.begin() + static_cast<std::ptrdiff_t>(oldEnd));
-  record.insert(record.begin() + static_cast<std::ptrdiff_t>(start), value.begin(), value.end());
+  // The slot is resized where it lies and then overwritten: no second
+  // buffer for a value that is replaced in nearly every record.
+  const size_t oldSize = oldEnd - start;
+  const size_t newSize = 2 + text.size() + 1;
+  if (newSize > oldSize) {
+    record.insert(record.begin() + static_cast<std::ptrdiff_t>(oldEnd), newSize - oldSize, uint8_t{0});
+  } else if (newSize < oldSize) {
+    record.erase(record.begin() + static_cast<std::ptrdiff_t>(start + newSize),
+                 record.begin() + static_cast<std::ptrdiff_t>(oldEnd));
+  }
+  uint8_t* slot = record.data() + start;
+  PutLE16(slot, static_cast<uint16_t>(text.size() + 1));
+  std::copy(text.begin(), text.end(), slot + 2);
+  slot[2 + text.size()] = 0;
 }
 
 double Operand(const Pass& pass, const CalcOperand& op, const std::string& constant, ByteView record,
@@ -87,14 +101,20 @@ int Evaluate(const Pass& pass, int field, Bytes& record, size_t index) {
   return 0;
 }
 
-int RecalculateWith(const Pass& pass, size_t index) {
+// `arena`, when given, holds the replaced records of a pass over many.
+int RecalculateWith(const Pass& pass, size_t index, RecordArena* arena = nullptr) {
   Database& db = pass.session.db;
   if (index >= db.recordCount()) return -1;
   ByteView stored = db.record(index);
-  Bytes work(stored.begin(), stored.end());
+  Bytes& work = pass.work;
+  work.assign(stored.begin(), stored.end());
   for (int f : pass.fields) Evaluate(pass, f, work, index);
   if (!std::equal(work.begin(), work.end(), stored.begin(), stored.end())) {
-    db.ReplaceRecord(index, std::move(work));
+    if (arena) {
+      db.ReplaceRecord(index, ByteView(work), *arena);
+    } else {
+      db.ReplaceRecord(index, ByteView(work));
+    }
   }
   return 0;
 }
@@ -103,9 +123,18 @@ int RecalculateWith(const Pass& pass, size_t index) {
 // restricted. Stops at the first failure.
 int Walk(const Pass& pass, size_t start) {
   const bool restricted = pass.tester.Restricted();
-  for (size_t i = start; i < pass.session.db.recordCount(); ++i) {
+  RecordArena arena;
+  const Database& db = pass.session.db;
+  for (size_t i = start; i < db.recordCount(); ++i) {
+    // After a sort the records lie scattered over the file read in: ask
+    // for the next ones while this one is worked on, or the walk spends
+    // its time waiting for memory.
+    for (size_t ahead = i + 1; ahead <= i + kPrefetchRecords && ahead < db.recordCount(); ++ahead) {
+      const ByteView next = db.record(ahead);
+      for (size_t at = 0; at < next.size(); at += 64) __builtin_prefetch(next.data() + at);
+    }
     if (restricted && !pass.tester.InView(i)) continue;
-    if (RecalculateWith(pass, i) != 0) return -1;
+    if (RecalculateWith(pass, i, &arena) != 0) return -1;
   }
   return 0;
 }

@@ -4,6 +4,10 @@
 #include <cstring>
 #include <optional>
 
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
+
 #include "engine/value_text.h"
 
 namespace cx {
@@ -20,6 +24,45 @@ int SlotAt(const Schema& schema, int position, bool fieldNumberOrder) {
   return fieldNumberOrder ? position : schema.fieldOrder[position];
 }
 
+// Where `text` first holds a byte that makes a value need quotes (a double
+// quote, the separator, CR or LF), or npos. Export asks this of every value
+// and most hold none, so long ones are scanned 16 bytes at a time.
+size_t FirstSpecial(std::string_view text, char separator) {
+  auto special = [separator](char c) {
+    return c == csv::kQuote || c == separator || c == '\r' || c == '\n';
+  };
+  size_t i = 0;
+#if defined(__SSE2__)
+  if (text.size() >= 16) {
+    const __m128i quote = _mm_set1_epi8(csv::kQuote);
+    const __m128i sep = _mm_set1_epi8(separator);
+    const __m128i cr = _mm_set1_epi8('\r');
+    const __m128i lf = _mm_set1_epi8('\n');
+    auto hits = [&](size_t at) {
+      const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + at));
+      const __m128i any = _mm_or_si128(_mm_or_si128(_mm_cmpeq_epi8(v, quote), _mm_cmpeq_epi8(v, sep)),
+                                       _mm_or_si128(_mm_cmpeq_epi8(v, cr), _mm_cmpeq_epi8(v, lf)));
+      return static_cast<unsigned>(_mm_movemask_epi8(any));
+    };
+    for (; i + 16 <= text.size(); i += 16) {
+      if (unsigned mask = hits(i)) return i + static_cast<size_t>(__builtin_ctz(mask));
+    }
+    // The last bytes as one more block that overlaps the one before.
+    if (i < text.size()) {
+      const size_t at = text.size() - 16;
+      if (unsigned mask = hits(at)) return at + static_cast<size_t>(__builtin_ctz(mask));
+    }
+    return std::string_view::npos;
+  }
+#endif
+  for (; i < text.size(); ++i) {
+    if (special(text[i])) return i;
+  }
+  return std::string_view::npos;
+}
+
+constexpr size_t kWriteBlock = size_t{1} << 16;
+
 bool IsNotUsed(const Schema& schema, int slot) {
   return slot >= format::kFieldCount || schema.field[slot].type() == FieldType::NotUsed;
 }
@@ -31,16 +74,24 @@ void QuoteCsvValue(std::string_view text, std::string& out, bool quoteAll, char 
     if (quoteAll) out += "\"\"";
     return;
   }
-  auto holds = [&text](char c) { return std::memchr(text.data(), c, text.size()) != nullptr; };
-  const bool quotes = holds(csv::kQuote);
-  const bool wrap = quoteAll || quotes || holds(separator) || holds('\r') || holds('\n');
+  const size_t first = FirstSpecial(text, separator);
+  const bool wrap = quoteAll || first != std::string_view::npos;
+  const bool quotes = first != std::string_view::npos &&
+                      std::memchr(text.data() + first, csv::kQuote, text.size() - first) != nullptr;
   if (wrap) out.push_back(csv::kQuote);
   if (!quotes) {
     out.append(text);
   } else {
-    for (char c : text) {
-      if (c == csv::kQuote) out.push_back(csv::kQuote);
-      out.push_back(c);
+    // Runs up to and including each quote, then the quote once more.
+    size_t from = 0;
+    for (;;) {
+      const void* quote = std::memchr(text.data() + from, csv::kQuote, text.size() - from);
+      const size_t to = quote ? static_cast<size_t>(static_cast<const char*>(quote) - text.data()) + 1
+                              : text.size();
+      out.append(text.data() + from, to - from);
+      if (!quote) break;
+      out.push_back(csv::kQuote);
+      from = to;
     }
   }
   if (wrap) out.push_back(csv::kQuote);
@@ -50,9 +101,10 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
                 const CsvSettings& settings, const LocaleInfo& locale, UiPort& ui,
                 const LinkRestriction* link) {
   const Schema& schema = db.schema();
-  const ValueContext values{schema, db.popups(), locale};
+  const ValueTextWriter values(ValueContext{schema, db.popups(), locale});
   int result = 1;
-  std::string line;
+  std::string pending;  // whole lines not yet written
+  std::string text;
 
   if (options.withHeader) {
     // Separators between the names written, so a Not-Used first column
@@ -62,12 +114,13 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
     for (int pos = 0; pos < format::kFieldCount; ++pos) {
       int slot = schema.fieldOrder[pos];
       if (IsNotUsed(schema, slot)) continue;
-      if (!first) line.push_back(settings.separator);
+      if (!first) pending.push_back(settings.separator);
       first = false;
-      QuoteCsvValue(schema.field[slot].name.str(), line, settings.alwaysQuote, settings.separator);
+      QuoteCsvValue(schema.field[slot].name.str(), pending, settings.alwaysQuote, settings.separator);
     }
-    line.push_back(csv::kLineEnd);
-    out.Write(line);
+    pending.push_back(csv::kLineEnd);
+    out.Write(pending);
+    pending.clear();
   }
 
   std::optional<ViewTester> view;
@@ -85,21 +138,35 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
       result = 0;
       continue;
     }
-    line.clear();
     const auto fieldValues = FieldValues(record);
     for (int pos = 0; pos < format::kFieldCount; ++pos) {
       int slot = SlotAt(schema, pos, options.fieldNumberOrder);
       if (IsNotUsed(schema, slot)) continue;
-      if (pos != 0) line.push_back(settings.separator);
+      if (pos != 0) pending.push_back(settings.separator);
       if (schema.field[slot].type() == FieldType::Image) continue;
-      std::string text = ValueTextOf(values, slot, fieldValues[slot]);
-      if (text.size() > csv::kMaxValueText) text.resize(csv::kMaxValueText);
-      QuoteCsvValue(text.empty() ? std::string_view("No Value") : std::string_view(text), line,
-                    options.quoteAll, settings.separator);
+      // Most values need no quotes: they are formatted in place and only
+      // the rare one that does is taken out again and quoted.
+      const size_t start = pending.size();
+      values.Append(slot, fieldValues[slot], pending);
+      if (pending.size() - start > csv::kMaxValueText) pending.resize(start + csv::kMaxValueText);
+      const std::string_view value(pending.data() + start, pending.size() - start);
+      if (value.empty()) {
+        QuoteCsvValue("No Value", pending, options.quoteAll, settings.separator);
+      } else if (options.quoteAll || FirstSpecial(value, settings.separator) != std::string_view::npos) {
+        text.assign(value);
+        pending.resize(start);
+        QuoteCsvValue(text, pending, options.quoteAll, settings.separator);
+      }
     }
-    line.push_back(csv::kLineEnd);
-    if (!out.Write(line)) result = 0;
+    pending.push_back(csv::kLineEnd);
+    // Lines go out in blocks: one write per line would copy every byte
+    // once more into the sink's own buffer.
+    if (pending.size() >= kWriteBlock) {
+      if (!out.Write(pending)) result = 0;
+      pending.clear();
+    }
   }
+  if (!pending.empty() && !out.Write(pending)) result = 0;
   return result;
 }
 

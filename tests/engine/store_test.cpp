@@ -272,6 +272,47 @@ TEST_F(StoreTest, AddingStopsAtTheRecordLimit) {
   EXPECT_EQ(back.record(65503)[3], 7);
 }
 
+// A recalculation replaces records through an arena that is gone long
+// before the records are saved; siblings in a block are replaced, deleted
+// and moved on their own afterwards.
+TEST_F(StoreTest, RecordsCopiedThroughAnArenaOutliveItAndEachOther) {
+  Database db = Database::CreateNew(dir.File("arena.PDB"), "arena");
+  db.schema() = testing::SchemaOf({FieldType::Unique, FieldType::Text});
+  constexpr int kRecords = 400;  // enough to fill blocks of several sizes
+  for (int i = 0; i < kRecords; ++i) db.AppendRecord(SlotWriter().Number(i + 1).End().bytes);
+  const uint32_t next = db.NextUniqueNumber();
+  std::vector<ByteVector> expected(kRecords);
+  {
+    RecordArena arena;
+    for (int i = 0; i < kRecords; ++i) {
+      expected[i] = SlotWriter().Number(i + 1).Text(std::string(i % 97 + 1, char('a' + i % 26))).End().bytes;
+      db.ReplaceRecord(i, ByteView(expected[i]), arena);
+    }
+    // A number past the next one moves it on, as any replacement does.
+    expected[7] = SlotWriter().Number(next + 50).Text("big").End().bytes;
+    db.ReplaceRecord(7, ByteView(expected[7]), arena);
+  }
+  EXPECT_EQ(db.TakeUniqueNumber(), next + 51);
+  for (int i = 0; i < kRecords; i += 3) {
+    expected[i] = SlotWriter().Number(i + 1).Text("own").End().bytes;
+    db.ReplaceRecord(i, expected[i]);
+  }
+  for (int i = kRecords - 1; i >= 0; i -= 5) {
+    db.DeleteRecord(i);
+    expected.erase(expected.begin() + i);
+  }
+  db.MoveRecord(0, db.recordCount() - 1);
+  std::rotate(expected.begin(), expected.begin() + 1, expected.end());
+
+  ASSERT_TRUE(db.Save(FixedClock(1)).ok());
+  Database back;
+  ASSERT_TRUE(back.Open(db.path(), ui).ok());
+  ASSERT_EQ(back.recordCount(), expected.size());
+  for (size_t i = 0; i < expected.size(); ++i) {
+    EXPECT_TRUE(std::ranges::equal(back.record(i), expected[i])) << i;
+  }
+}
+
 TEST_F(StoreTest, NextUniqueNumber) {
   Database db = Database::CreateNew(dir.File("u.PDB"), "u");
   db.schema() = testing::SchemaOf({FieldType::Unique, FieldType::Link, FieldType::Integer});

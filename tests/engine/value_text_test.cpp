@@ -112,6 +112,40 @@ TEST_F(ValueTextTest, EveryType) {
   for (int slot = 0; slot < 19; ++slot) EXPECT_EQ(Text(record, slot), expected[slot]) << slot;
 }
 
+// The writer reads the patterns once for a whole export; under every
+// pattern it must append to what the buffer holds exactly the text that
+// the per-value formatter gives.
+TEST_F(ValueTextTest, TheWriterAppendsWhatEachValueGives) {
+  const auto record = SlotWriter()
+                          .Text("Hello").Number(7).Text("2.5").Byte(255).Byte(1).Number(77).Byte(0)
+                          .Number(366 + 40).Raw({5, 7, 0, 0}).Number(12).Empty().Text("n")
+                          .Empty().Text("x").Text("3725").Text("400").Text("2.50").Text("1")
+                          .End()
+                          .bytes;
+  const auto shortRecord = SlotWriter().Text("only").End().bytes;
+  LocaleInfo twelve = Times("hh:mm:ss tt");
+  twelve.shortDate = "dd.MMM.yy";
+  twelve.dateSeparator = '.';
+  twelve.am = "vorm.";
+  const LocaleInfo patterns[] = {LocaleInfo::UnitedStates(), Dates("yyyy-MM-dd", '-'),
+                                 Dates("d/q/yyyy", '/'), Times("H:mm:ss"), Times("h:mm:ss"), twelve};
+  for (const LocaleInfo& l : patterns) {
+    const ValueContext ctx{schema, popups, l};
+    const ValueTextWriter writer(ctx);
+    for (const auto* r : {&record, &shortRecord}) {
+      std::string out = "before|";
+      std::string expected = out;
+      for (int slot = -1; slot <= 30; ++slot) {
+        writer.Append(slot, slot >= 0 && slot < 30 ? FieldValue(*r, slot) : std::nullopt, out);
+        expected += ValueText(ctx, *r, slot);
+        out += '|';
+        expected += '|';
+      }
+      EXPECT_EQ(out, expected) << l.shortDate << " " << l.timeFormat;
+    }
+  }
+}
+
 TEST_F(ValueTextTest, CalculatedDateOfALargeDayNumber) {
   auto calculated = [](const char* stored) {
     SlotWriter w;

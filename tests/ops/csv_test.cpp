@@ -47,6 +47,30 @@ TEST(CsvQuoteTest, QuotesOnlyWhatNeedsIt) {
   EXPECT_EQ(Quote("a;b", false, ';'), "\"a;b\"");
 }
 
+// Long values are scanned in blocks: a character that needs quotes must
+// be found at any place of a value of any length, including the bytes a
+// block does not cover and a second quote after the first special byte.
+TEST(CsvQuoteTest, FindsTheSpecialByteAtEveryPlace) {
+  for (size_t length = 1; length <= 40; ++length) {
+    for (size_t at = 0; at < length; ++at) {
+      for (char special : {'"', ';', '\r', '\n'}) {
+        std::string text(length, 'x');
+        text[at] = special;
+        std::string expected = "\"" + text.substr(0, at) + (special == '"' ? "\"\"" : std::string(1, special)) +
+                               text.substr(at + 1) + "\"";
+        EXPECT_EQ(Quote(text, false, ';'), expected) << length << " " << at << " " << int(special);
+      }
+      // A quote after the first special byte is doubled as well.
+      std::string twoKinds(length, 'y');
+      twoKinds[at] = '\n';
+      twoKinds.back() = '"';
+      const std::string doubled = twoKinds.substr(0, length - 1) + "\"\"";
+      EXPECT_EQ(Quote(twoKinds, false), "\"" + doubled + "\"") << length << " " << at;
+    }
+    EXPECT_EQ(Quote(std::string(length, 'x'), false, ';'), std::string(length, 'x'));
+  }
+}
+
 TEST(CsvReadTest, SeparatorAfterClosingQuoteBelongsToIt) {
   CsvStream in("a,,\"b,c\",\nnext\n");
   CsvLine line;

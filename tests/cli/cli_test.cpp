@@ -9,23 +9,13 @@
 #include "engine/record_store.h"
 #include "platform/file_io.h"
 #include "platform/text_codec.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
-Result RunTool(std::vector<std::string> args) {
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result RunTool(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
 
 // A database with one record holding a value of every type.
 std::string MakeEveryType(const testing::TempDir& dir) {

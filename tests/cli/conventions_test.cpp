@@ -8,24 +8,13 @@
 #include "cli/command.h"
 #include "cli/global_options.h"
 #include "cli/manual.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
-Result Cli(std::vector<std::string> args) {
-  std::ostringstream out, err;
-  CliUi ui(err);
-  ui.SetAnswer(false);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args), {}, false); }
 
 TEST(CliConventions, ErrorsNameTheToolAndTheCommand) {
   testing::TempDir dir;

@@ -20,6 +20,7 @@
 #include "cli/global_options.h"
 #include "engine/record_store.h"
 #include "platform/file_io.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
@@ -27,18 +28,7 @@ namespace {
 
 using testing::TempDir;
 
-struct Result {
-  int code;  // -1: still running when the time was up (then killed)
-  std::string out;
-  std::string err;
-};
-
-Result Cli(std::vector<std::string> args) {
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
 
 std::string ReadText(const std::string& path) {
   std::ifstream in(path, std::ios::binary);

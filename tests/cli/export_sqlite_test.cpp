@@ -9,23 +9,13 @@
 #include "engine/record.h"
 #include "engine/record_store.h"
 #include "platform/file_io.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
-Result Cli(std::vector<std::string> args) {
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
 
 // The rows sqlite3 prints for `sql`, "|" between columns.
 std::string Sql(const testing::TempDir& dir, const std::string& db, const std::string& sql) {

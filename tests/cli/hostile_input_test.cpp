@@ -13,24 +13,13 @@
 #include "engine/record_store.h"
 #include "platform/file_io.h"
 #include "tests/engine/test_databases.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
-Result Cli(std::vector<std::string> args) {
-  args.insert(args.begin(), {"--date-format", "M/d/yyyy", "--time-format", "HH:mm:ss", "--no"});
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args), {"--date-format", "M/d/yyyy", "--time-format", "HH:mm:ss", "--no"}); }
 
 const std::string kSnowman = "\xE2\x98\x83";  // U+2603, not in Windows-1252
 

@@ -15,25 +15,14 @@
 #include "engine/record_store.h"
 #include "ops/database_settings.h"
 #include "platform/file_io.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
 // Every run uses US dates and 24-hour times whatever the machine says.
-Result Cli(std::vector<std::string> args) {
-  args.insert(args.begin(), {"--date-format", "M/d/yyyy", "--time-format", "H:mm:ss", "--decimal", "."});
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args), {"--date-format", "M/d/yyyy", "--time-format", "H:mm:ss", "--decimal", "."}); }
 
 void WriteText(const std::string& path, const std::string& text) {
   std::ofstream(path, std::ios::binary) << text;

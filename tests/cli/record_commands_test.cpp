@@ -13,26 +13,15 @@
 #include "cli/global_options.h"
 #include "engine/record.h"
 #include "platform/file_io.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
 namespace {
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
 // German conventions, so that typed values must follow the options given
 // rather than anything built in.
-Result Cli(std::vector<std::string> args) {
-  args.insert(args.begin(), {"--date-format", "dd.MM.yyyy", "--time-format", "HH:mm:ss", "--decimal", ","});
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args), {"--date-format", "dd.MM.yyyy", "--time-format", "HH:mm:ss", "--decimal", ","}); }
 
 Bytes FileBytes(const std::string& path) {
   Bytes b;

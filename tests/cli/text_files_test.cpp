@@ -19,6 +19,7 @@
 #include "ops/report.h"
 #include "ops/text_encoding.h"
 #include "platform/text_codec.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
@@ -26,18 +27,7 @@ namespace {
 
 using testing::TempDir;
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
-Result Cli(std::vector<std::string> args) {
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
 
 std::string Slurp(const std::string& path) {
   std::ifstream in(path, std::ios::binary);

@@ -8,6 +8,7 @@
 #include "cli/global_options.h"
 #include "design/security.h"
 #include "tests/design/design_db.h"
+#include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
 namespace cx::cli {
@@ -16,18 +17,7 @@ namespace {
 using cx::testing::FileBytes;
 using T = FieldType;
 
-struct Result {
-  int code;
-  std::string out;
-  std::string err;
-};
-
-Result RunTool(std::vector<std::string> args) {
-  std::ostringstream out, err;
-  CliUi ui(err);
-  int code = RunCli(args, out, err, ui);
-  return {code, out.str(), err.str()};
-}
+Result RunTool(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
 
 class DesignCommands : public ::testing::Test {
  protected:

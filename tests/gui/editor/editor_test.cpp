@@ -541,7 +541,7 @@ void ChangeValue(RecordForm& form, int field) {
     case FieldType::Text:
     case FieldType::Note:
     case FieldType::DBPopup:
-      form.SetText(field, form.Text(field).substr(0, 3) + "\xe9dited");
+      form.SetText(field, form.Text(field).substr(0, 3) + "\xe9" "dited");
       break;
     case FieldType::Linked:
       form.SetText(field, "re-linked");

@@ -85,24 +85,6 @@ std::string InView(const std::string& path) {
   return Column(r.out, "Name");
 }
 
-// Questions go to the terminal when there is one; the refusal under test
-// needs there to be none.
-class NoTerminalInput {
- public:
-  NoTerminalInput() : saved_(::dup(STDIN_FILENO)) {
-    const int null = ::open("/dev/null", O_RDONLY);
-    ::dup2(null, STDIN_FILENO);
-    ::close(null);
-  }
-  ~NoTerminalInput() {
-    ::dup2(saved_, STDIN_FILENO);
-    ::close(saved_);
-  }
-
- private:
-  int saved_;
-};
-
 // The temporary print file goes next to the data folder.
 class ScopedEnv {
  public:

@@ -29,23 +29,6 @@ Bytes FileBytes(const std::string& path) {
   return b;
 }
 
-// Questions and prompts find no terminal, even when the tests run from one.
-class NoTerminalInput {
- public:
-  NoTerminalInput() : saved_(::dup(STDIN_FILENO)) {
-    const int null = ::open("/dev/null", O_RDONLY);
-    ::dup2(null, STDIN_FILENO);
-    ::close(null);
-  }
-  ~NoTerminalInput() {
-    ::dup2(saved_, STDIN_FILENO);
-    ::close(saved_);
-  }
-
- private:
-  int saved_;
-};
-
 std::string Field(const std::string& name, const std::string& text) {
   return "\"name\":\"" + name + "\",\"text\":\"" + text + "\"";
 }

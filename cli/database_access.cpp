@@ -104,6 +104,19 @@ bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& r
   return true;
 }
 
+bool RecordOption(const Arguments& args, const Database& db, std::optional<size_t>& record,
+                  std::string& error) {
+  auto text = args.value("--record");
+  if (!text) return true;
+  auto n = ParseNumber(*text);
+  if (!n || *n < 0 || static_cast<size_t>(*n) >= db.recordCount()) {
+    error = "--record takes a record index below " + std::to_string(db.recordCount());
+    return false;
+  }
+  record = static_cast<size_t>(*n);
+  return true;
+}
+
 int ResolveField(const Database& db, const std::string& text) {
   if (auto n = ParseNumber(text); n && *n >= 0 && *n < format::kFieldCount) return static_cast<int>(*n);
   std::optional<std::string> wanted = StoredTextOrNothing(text);

@@ -44,6 +44,8 @@ bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");
 // names a record of `db`; false (with `error` set) for anything else.
 bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& record,
                   std::string& error);
+bool RecordOption(const Arguments& args, const Database& db, std::optional<size_t>& record,
+                  std::string& error);
 
 // A field given as a slot number (0-29) or a field name; -1 when neither.
 int ResolveField(const Database& db, const std::string& text);

@@ -6,6 +6,7 @@
 
 #include "cli/command.h"
 #include "cli/global_options.h"
+#include "cli/syntax.h"
 
 namespace cx::cli {
 namespace {
@@ -94,20 +95,31 @@ std::string ManPage(const std::string& version) {
   return s.str();
 }
 
+HelpOptions DeclaredOptions(const Syntax& syntax) {
+  HelpOptions found;
+  for (const Syntax::OptionInfo& o : syntax.options()) {
+    for (const std::string& name : o.names) {
+      AddOnce(found.all, name);
+      if (!o.value.empty()) AddOnce(found.withValue, name);
+    }
+  }
+  return found;
+}
+
 std::string BashCompletion() {
-  const HelpOptions global = OptionsInHelp(GeneralHelp());
+  const HelpOptions global = DeclaredOptions(GlobalSyntax());
   std::vector<std::string> names;
   std::ostringstream cases;
   std::vector<std::string> withValue = global.withValue;
   for (const auto& c : Registry::Instance().All()) {
     names.push_back(c->name());
-    const HelpOptions own = OptionsInHelp(c->help());
+    Syntax syntax(c->name());
+    c->Declare(syntax);
+    const HelpOptions own = syntax.takesEverything() ? OptionsInHelp(c->help()) : DeclaredOptions(syntax);
     cases << "    " << c->name() << ") opts=" << Words(own.all) << " ;;\n";
     for (const auto& o : own.withValue) AddOnce(withValue, o);
   }
   names.push_back("help");
-  // "--help" takes a command name, offered below like any other word.
-  withValue.erase(std::remove(withValue.begin(), withValue.end(), "--help"), withValue.end());
 
   std::ostringstream s;
   s << "# bash completion for cardovex-cli (generated from its help texts)\n"

@@ -14,6 +14,9 @@ struct HelpOptions {
   std::vector<std::string> withValue;
 };
 HelpOptions OptionsInHelp(const std::string& help);
+class Syntax;
+// The same, from a declaration.
+HelpOptions DeclaredOptions(const Syntax& syntax);
 
 // The page in man(7) markup.
 std::string ManPage(const std::string& version);

@@ -8,6 +8,7 @@
 
 #include "cli/args.h"
 #include "cli/command.h"
+#include "cli/syntax.h"
 #include "ops/text_encoding.h"
 #include "ops/text_sink.h"
 #include "platform/status.h"
@@ -18,9 +19,14 @@ inline constexpr const char* kEncodingHelp =
     "  --encoding E  the text file's encoding: utf-8 (the default) or\n"
     "                windows-1252 (the bytes the database holds)\n";
 
+// Declares --encoding.
+void DeclareEncoding(Syntax& syntax);
+
 // Reads --encoding. False after a usage error (exit 2 in `code`) for a name
 // that is neither.
 bool EncodingOption(Context& ctx, const Command& command, const Args& args, TextEncoding& encoding,
+                    int& code);
+bool EncodingOption(Context& ctx, const Command& command, const Arguments& args, TextEncoding& encoding,
                     int& code);
 
 // Writes what `produce` puts into its sink to `path` ("-": standard output)

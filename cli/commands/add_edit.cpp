@@ -54,7 +54,7 @@ void PrintIndex(Context& ctx, const char* verb, size_t index) {
   ctx.out << "record " << index << " " << verb << "\n";
 }
 
-class AddCommand : public Command {
+class AddCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "add"; }
   std::string summary() const override { return "add a record with the values given"; }
@@ -68,7 +68,7 @@ class AddCommand : public Command {
            "Prints the new record's index (with --json: {\"index\": N}).\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();
@@ -91,7 +91,7 @@ class AddCommand : public Command {
   }
 };
 
-class EditCommand : public Command {
+class EditCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "edit"; }
   std::string summary() const override { return "change the named fields of one record"; }
@@ -108,7 +108,7 @@ class EditCommand : public Command {
            "FILE is not written.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();

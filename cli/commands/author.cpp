@@ -12,7 +12,7 @@
 namespace cx::cli {
 namespace {
 
-class AuthorCommand : public Command {
+class AuthorCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "author"; }
   std::string summary() const override { return "show or set the author and comments"; }
@@ -24,7 +24,7 @@ class AuthorCommand : public Command {
            "Changes need the \"DB Properties\" access.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--author", "--comments"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

@@ -13,7 +13,7 @@
 namespace cx::cli {
 namespace {
 
-class BeamCommand : public Command {
+class BeamCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "beam"; }
   std::string summary() const override { return "send a database or records over OBEX (TCP)"; }
@@ -27,7 +27,7 @@ class BeamCommand : public Command {
            "  --wait SECONDS  how long to keep looking for a peer (default 60)\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--to", "--record", "--wait"}, {"--records"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

@@ -15,7 +15,7 @@
 namespace cx::cli {
 namespace {
 
-class DeleteCommand : public Command {
+class DeleteCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "delete"; }
   std::string summary() const override { return "delete the records within or outside the filter range, or all"; }
@@ -36,7 +36,7 @@ class DeleteCommand : public Command {
            "Calculated fields are brought up to date afterwards.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--record"}, {"--within", "--outside", "--all"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

@@ -252,7 +252,7 @@ std::string InsertSql(const std::string& table, size_t count) {
   return sql + ")";
 }
 
-class ExportSqliteCommand : public Command {
+class ExportSqliteCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "export-sqlite"; }
   std::string summary() const override { return "write databases as tables of one SQLite file"; }
@@ -289,7 +289,7 @@ class ExportSqliteCommand : public Command {
            "With --json: {\"tables\": [{\"table\", \"file\", \"records\", \"columns\"}]}.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();

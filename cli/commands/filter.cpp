@@ -27,7 +27,7 @@ std::string LimitTimeText(const TimeOfDay& t, const LocaleInfo& locale) {
   return Cp1252ToUtf8(TimeText(t.seconds, t.minutes, t.hours, locale));
 }
 
-class FilterCommand : public Command {
+class FilterCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "filter"; }
   std::string summary() const override { return "show or set the two filters"; }
@@ -60,7 +60,7 @@ class FilterCommand : public Command {
            "'records FILE' then lists exactly the records in view.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--filter1", "--filter2"}, {"--not1", "--not2", "--or", "--off"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");

@@ -28,7 +28,7 @@ bool ReadOnlyFile(const std::string& path) {
 // more); a longer text would be searched for in full once and cut after.
 constexpr size_t kSearchTextMax = 34;
 
-class FindCommand : public Command {
+class FindCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "find"; }
   std::string summary() const override { return "search the records in view for a text"; }
@@ -57,7 +57,7 @@ class FindCommand : public Command {
            "Database!\" on stderr. Exit status 0 when there was a hit, 1 when none.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--field"}, {"--case-sensitive", "--begins-with", "--records"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TEXT");

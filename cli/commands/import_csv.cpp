@@ -13,7 +13,7 @@
 namespace cx::cli {
 namespace {
 
-class ImportCsvCommand : public Command {
+class ImportCsvCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "import-csv"; }
   std::string summary() const override { return "append the records of a CSV file"; }
@@ -42,7 +42,7 @@ class ImportCsvCommand : public Command {
            "Needs the \"Add Records\" access.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--encoding"}, {"--by-slot", "--strict", "--header"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE IN");

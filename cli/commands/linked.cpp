@@ -12,7 +12,7 @@
 namespace cx::cli {
 namespace {
 
-class LinkedCommand : public Command {
+class LinkedCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "linked"; }
   std::string summary() const override { return "list the records a Link field leads to"; }
@@ -27,7 +27,7 @@ class LinkedCommand : public Command {
            "The linked database must pass its \"Open Database\" access check.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {"--all"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 3) return UsageError(ctx, *this, "expected FILE RECORD FIELD");

@@ -25,7 +25,7 @@ struct Entry {
   Status read;
 };
 
-class ListCommand : public Command {
+class ListCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "list"; }
   std::string summary() const override { return "list the databases in the data folder"; }
@@ -42,7 +42,7 @@ class ListCommand : public Command {
            "\"name\", \"records\" and \"protected\").\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() > 1) return UsageError(ctx, *this, "expected at most FOLDER");

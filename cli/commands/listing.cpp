@@ -11,7 +11,7 @@
 namespace cx::cli {
 namespace {
 
-class ListingCommand : public Command {
+class ListingCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "listing"; }
   std::string summary() const override { return "write records as a \"name: value\" text listing"; }
@@ -29,7 +29,7 @@ class ListingCommand : public Command {
            std::string(kEncodingHelp);
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--record", "-o", "--encoding"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

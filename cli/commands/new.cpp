@@ -12,7 +12,7 @@
 namespace cx::cli {
 namespace {
 
-class NewCommand : public Command {
+class NewCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "new"; }
   std::string summary() const override { return "create a new database with the fields given"; }
@@ -30,7 +30,7 @@ class NewCommand : public Command {
            kFieldSpecHelp;
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--name", "--field"}, {"--extension", "--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

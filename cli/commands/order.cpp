@@ -14,7 +14,7 @@
 namespace cx::cli {
 namespace {
 
-class OrderCommand : public Command {
+class OrderCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "order"; }
   std::string summary() const override { return "show or change the display order of the fields"; }
@@ -32,7 +32,7 @@ class OrderCommand : public Command {
            "Properties\" access.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--set"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();

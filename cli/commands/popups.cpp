@@ -12,7 +12,7 @@
 namespace cx::cli {
 namespace {
 
-class PopupsCommand : public Command {
+class PopupsCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "popups"; }
   std::string summary() const override { return "list or edit a field's popup list"; }
@@ -32,7 +32,7 @@ class PopupsCommand : public Command {
            "Changes need the \"DB Properties\" and \"Edit Popups\" access.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();

@@ -12,7 +12,7 @@
 namespace cx::cli {
 namespace {
 
-class PrintCommand : public Command {
+class PrintCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "print"; }
   std::string summary() const override { return "print records through the print command"; }
@@ -27,7 +27,7 @@ class PrintCommand : public Command {
            "problem. Nothing is run when the listing is empty.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--record", "--command", "--arg"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

@@ -10,7 +10,7 @@
 namespace cx::cli {
 namespace {
 
-class RecalcCommand : public Command {
+class RecalcCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "recalc"; }
   std::string summary() const override { return "recompute the calculated fields and save"; }
@@ -23,7 +23,7 @@ class RecalcCommand : public Command {
            "the new order. Results use the decimal separator of the global options.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

@@ -22,7 +22,7 @@ std::atomic<bool>& StopFlag() {
 
 extern "C" void OnStopSignal(int) { StopFlag() = true; }
 
-class ReceiveCommand : public Command {
+class ReceiveCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "receive"; }
   std::string summary() const override { return "receive beamed databases and records"; }
@@ -43,7 +43,7 @@ class ReceiveCommand : public Command {
            "Prints \"Listening on ADDR\" and one line per object.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {"--listen", "--count"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

@@ -12,7 +12,7 @@
 namespace cx::cli {
 namespace {
 
-class RenameCommand : public Command {
+class RenameCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "rename"; }
   std::string summary() const override { return "change the database's name (not the file's)"; }
@@ -22,7 +22,7 @@ class RenameCommand : public Command {
            "keeps its file name. Needs the \"DB Properties\" access.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

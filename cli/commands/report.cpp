@@ -16,7 +16,7 @@
 namespace cx::cli {
 namespace {
 
-class ReportCommand : public Command {
+class ReportCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "report"; }
   std::string summary() const override { return "count, extremes, sum and average of a field"; }
@@ -33,7 +33,7 @@ class ReportCommand : public Command {
            std::string(kEncodingHelp);
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"-o", "--encoding"}, {"--force"});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     TextEncoding encoding;

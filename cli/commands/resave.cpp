@@ -8,7 +8,7 @@
 namespace cx::cli {
 namespace {
 
-class ResaveCommand : public Command {
+class ResaveCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "resave"; }
   std::string summary() const override { return "open a database and save it again (to OUT if given)"; }
@@ -18,7 +18,7 @@ class ResaveCommand : public Command {
            "replaced is never damaged: the new one is written beside it, flushed and\n"
            "renamed over it.\n";
   }
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());

@@ -13,7 +13,7 @@
 namespace cx::cli {
 namespace {
 
-class SecurityCommand : public Command {
+class SecurityCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "security"; }
   std::string summary() const override { return "show or set the access levels and the password"; }
@@ -32,7 +32,7 @@ class SecurityCommand : public Command {
            "\"Password Required\", given with --password).\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--set-password"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();

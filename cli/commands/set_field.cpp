@@ -33,7 +33,7 @@ std::optional<int> ListEntry(const List& list, const std::string& text) {
   return std::nullopt;
 }
 
-class SetFieldCommand : public Command {
+class SetFieldCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "set-field"; }
   std::string summary() const override {
@@ -71,7 +71,7 @@ class SetFieldCommand : public Command {
            "leaves the file byte for byte as it was. Needs the \"DB Properties\" access.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv,
               {"--name", "--type", "--max-chars", "--places", "--pixels", "--visible", "--export",
                "--popups-append", "--default", "--behavior", "--other-db", "--other-field",

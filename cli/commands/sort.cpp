@@ -11,7 +11,7 @@
 namespace cx::cli {
 namespace {
 
-class SortCommand : public Command {
+class SortCommand : public HandParsedCommand {
  public:
   std::string name() const override { return "sort"; }
   std::string summary() const override { return "set up to three sort keys, sort and save"; }
@@ -30,7 +30,7 @@ class SortCommand : public Command {
            "Records that compare equal on every key may come out in any order.\n";
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     const auto& p = args.positional();

@@ -23,6 +23,15 @@ inline bool TextTargetAllowed(Context& ctx, const Args& args, const std::string&
   return false;
 }
 
+inline bool TextTargetAllowed(Context& ctx, const Arguments& args, const std::string& out,
+                              const std::string& in) {
+  if (args.has("--force")) return true;
+  Status s = CheckTextTarget(out, {in});
+  if (s) return true;
+  Failure(ctx, s.message() + " (--force writes it anyway)");
+  return false;
+}
+
 class Utf8StreamSink : public TextSink {
  public:
   explicit Utf8StreamSink(std::ostream& out) : out_(out) {}

@@ -13,7 +13,7 @@
 namespace cx::cli {
 namespace {
 
-class TransferCommand : public Command {
+class TransferCommand : public HandParsedCommand {
  public:
   explicit TransferCommand(bool move) : move_(move) {}
   std::string name() const override { return move_ ? "move-records" : "copy-records"; }
@@ -38,7 +38,7 @@ class TransferCommand : public Command {
                   : "");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+  int RunRaw(Context& ctx, const std::vector<std::string>& argv) override {
     Args args(argv, {"--record"}, {});
     if (!args.ok()) return UsageError(ctx, *this, args.error());
     if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TARGET");

@@ -45,17 +45,8 @@ class Command {
   // Its arguments and options with their help, declared once.
   virtual void Declare(Syntax& syntax) const = 0;
   // The usage lines and option descriptions shown by --help COMMAND.
-  virtual std::string help() const;
+  std::string help() const;
   virtual int Run(Context& ctx, const Arguments& args) = 0;
-};
-
-// A command that still reads its arguments itself.
-class HandParsedCommand : public Command {
- public:
-  void Declare(Syntax& syntax) const final { syntax.TakeEverything(); }
-  std::string help() const override = 0;
-  int Run(Context& ctx, const Arguments& args) final { return RunRaw(ctx, args.positional()); }
-  virtual int RunRaw(Context& ctx, const std::vector<std::string>& args) = 0;
 };
 
 // The global options (global_options.cpp).

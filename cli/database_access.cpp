@@ -4,7 +4,7 @@
 #include <ostream>
 #include <tuple>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "design/security.h"
 #include "engine/database_folder.h"
 #include "ops/open_database.h"
@@ -88,19 +88,6 @@ bool SaveForCommand(Context& ctx, Database& db, const std::string& path) {
     Failure(ctx, s.message());
     return false;
   }
-  return true;
-}
-
-bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& record,
-                  std::string& error) {
-  auto text = args.value("--record");
-  if (!text) return true;
-  auto n = ParseNumber(*text);
-  if (!n || *n < 0 || static_cast<size_t>(*n) >= db.recordCount()) {
-    error = "--record takes a record index below " + std::to_string(db.recordCount());
-    return false;
-  }
-  record = static_cast<size_t>(*n);
   return true;
 }
 

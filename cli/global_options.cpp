@@ -8,7 +8,7 @@
 #include <ostream>
 #include <sstream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/json_output.h"
 #include "platform/locale_info.h"

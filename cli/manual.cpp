@@ -115,7 +115,7 @@ std::string BashCompletion() {
     names.push_back(c->name());
     Syntax syntax(c->name());
     c->Declare(syntax);
-    const HelpOptions own = syntax.takesEverything() ? OptionsInHelp(c->help()) : DeclaredOptions(syntax);
+    const HelpOptions own = DeclaredOptions(syntax);
     cases << "    " << c->name() << ") opts=" << Words(own.all) << " ;;\n";
     for (const auto& o : own.withValue) AddOnce(withValue, o);
   }

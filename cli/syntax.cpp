@@ -181,11 +181,6 @@ Syntax& Syntax::Globals(std::vector<std::string> words) {
   return *this;
 }
 
-Syntax& Syntax::TakeEverything() {
-  takeEverything_ = true;
-  return *this;
-}
-
 const Syntax::OptionInfo* Syntax::Find(const std::string& name) const {
   for (const OptionInfo& o : options_) {
     if (std::find(o.names.begin(), o.names.end(), name) != o.names.end()) return &o;
@@ -194,10 +189,6 @@ const Syntax::OptionInfo* Syntax::Find(const std::string& name) const {
 }
 
 bool Syntax::Parse(const std::vector<std::string>& words, Arguments& out, std::string& error) const {
-  if (takeEverything_) {
-    out.positional_ = words;
-    return true;
-  }
   return Run(words, out, nullptr, error);
 }
 

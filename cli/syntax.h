@@ -80,11 +80,6 @@ class Syntax {
   // of a form: {"--json", "--password"}.
   Syntax& Globals(std::vector<std::string> words);
 
-  // For commands that still read their arguments themselves: everything
-  // after the command's name is passed on untouched.
-  Syntax& TakeEverything();
-  bool takesEverything() const { return takeEverything_; }
-
   // Parses the words after the command's name. False with `error` in the
   // wording users and scripts know ("unknown option --x", "option --x
   // needs a value", "expected FILE OUT").
@@ -130,7 +125,6 @@ class Syntax {
   std::vector<OptionInfo> options_;
   std::vector<std::vector<std::string>> forms_;
   std::vector<std::string> globals_;
-  bool takeEverything_ = false;
   std::unique_ptr<CLI::App> app_;
 };
 

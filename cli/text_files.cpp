@@ -28,19 +28,6 @@ void DeclareEncoding(Syntax& syntax) {
                 "database holds)");
 }
 
-bool EncodingOption(Context& ctx, const Command& command, const Args& args, TextEncoding& encoding,
-                    int& code) {
-  encoding = TextEncoding::kUtf8;
-  std::optional<std::string> name = args.value("--encoding");
-  if (!name) return true;
-  if (std::optional<TextEncoding> e = ParseTextEncoding(*name)) {
-    encoding = *e;
-    return true;
-  }
-  code = UsageError(ctx, command, "unknown encoding " + *name + " (utf-8 or windows-1252)");
-  return false;
-}
-
 bool EncodingOption(Context& ctx, const Command& command, const Arguments& args, TextEncoding& encoding,
                     int& code) {
   encoding = TextEncoding::kUtf8;

@@ -6,7 +6,7 @@
 #include <functional>
 #include <string>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/syntax.h"
 #include "ops/text_encoding.h"
@@ -15,17 +15,11 @@
 
 namespace cx::cli {
 
-inline constexpr const char* kEncodingHelp =
-    "  --encoding E  the text file's encoding: utf-8 (the default) or\n"
-    "                windows-1252 (the bytes the database holds)\n";
-
 // Declares --encoding.
 void DeclareEncoding(Syntax& syntax);
 
 // Reads --encoding. False after a usage error (exit 2 in `code`) for a name
 // that is neither.
-bool EncodingOption(Context& ctx, const Command& command, const Args& args, TextEncoding& encoding,
-                    int& code);
 bool EncodingOption(Context& ctx, const Command& command, const Arguments& args, TextEncoding& encoding,
                     int& code);
 

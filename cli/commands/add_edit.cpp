@@ -2,7 +2,7 @@
 // typed in as the record editor takes it, then stored as its OK stores it.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/command_document.h"
 #include "cli/commands/design_common.h"

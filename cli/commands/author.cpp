@@ -1,6 +1,7 @@
 // author FILE [--author TEXT] [--comments TEXT]: the Author Information.
 #include <ostream>
 
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"

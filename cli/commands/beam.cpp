@@ -2,6 +2,7 @@
 // in view to another installation over OBEX.
 #include <ostream>
 
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json_output.h"

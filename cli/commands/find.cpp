@@ -5,6 +5,7 @@
 
 #include <ostream>
 
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"

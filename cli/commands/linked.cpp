@@ -1,6 +1,7 @@
 // linked FILE RECORD FIELD: the records a Link field of a record leads to.
 #include <ostream>
 
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"

@@ -1,6 +1,7 @@
 // new FILE: a new database with the fields given.
 #include <ostream>
 
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/field_spec.h"

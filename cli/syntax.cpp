@@ -1,9 +1,9 @@
 #include "cli/syntax.h"
 
-#include <CLI/CLI.hpp>
-
 #include <algorithm>
 #include <stdexcept>
+
+#include <CLI/CLI.hpp>
 
 namespace cx::cli {
 namespace {
@@ -189,16 +189,16 @@ const Syntax::OptionInfo* Syntax::Find(const std::string& name) const {
 }
 
 bool Syntax::Parse(const std::vector<std::string>& words, Arguments& out, std::string& error) const {
-  return Run(words, out, nullptr, error);
+  return ParseWords(words, out, nullptr, error);
 }
 
 bool Syntax::ParseKnown(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>& rest,
                         std::string& error) const {
-  return Run(words, out, &rest, error);
+  return ParseWords(words, out, &rest, error);
 }
 
-bool Syntax::Run(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>* rest,
-                 std::string& error) const {
+bool Syntax::ParseWords(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>* rest,
+                        std::string& error) const {
   auto& parser = static_cast<Parser&>(*app_);
   if (!rest && !parser.get_option_no_throw("arguments")) {
     // Every positional in one list: the declaration checks their number,

@@ -116,8 +116,8 @@ class Syntax {
   };
   const OptionInfo* Find(const std::string& name) const;
   std::string Word(const std::string& word, const Syntax* globals) const;
-  bool Run(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>* rest,
-           std::string& error) const;
+  bool ParseWords(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>* rest,
+                  std::string& error) const;
 
   std::string command_;
   std::string about_, notes_;

@@ -89,7 +89,7 @@ class Syntax {
   bool ParseKnown(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>& rest,
                   std::string& error) const;
 
-  // The command's help, through the formatter below; `globals` renders the
+  // The command's help, made by CLI11 through our formatter; `globals` renders the
   // global options named by Globals().
   std::string Help(const Syntax* globals) const;
   // "  --name VALUE  description" lines for every option.

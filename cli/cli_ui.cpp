@@ -7,7 +7,7 @@
 #include <iostream>
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {

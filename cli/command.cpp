@@ -29,6 +29,12 @@ std::vector<std::unique_ptr<Command>> Registry::All() const {
   return all;
 }
 
+std::string Command::help() const {
+  Syntax syntax(name());
+  Declare(syntax);
+  return syntax.Help(&GlobalSyntax());
+}
+
 int UsageError(Context& ctx, const Command& command, const std::string& message) {
   ctx.err << "cardovex-cli: " << command.name() << ": " << message << "\n";
   // An error object for a script carries the message, not the usage text.

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "cli/cli_ui.h"
+#include "cli/syntax.h"
 #include "platform/file_io.h"
 #include "platform/locale_info.h"
 
@@ -41,10 +42,15 @@ class Command {
   virtual std::string name() const = 0;
   // One line for the command list.
   virtual std::string summary() const = 0;
+  // Its arguments and options with their help, declared once.
+  virtual void Declare(Syntax& syntax) const = 0;
   // The usage lines and option descriptions shown by --help COMMAND.
-  virtual std::string help() const = 0;
-  virtual int Run(Context& ctx, const std::vector<std::string>& args) = 0;
+  std::string help() const;
+  virtual int Run(Context& ctx, const Arguments& args) = 0;
 };
+
+// The global options (global_options.cpp).
+const Syntax& GlobalSyntax();
 
 using CommandFactory = std::function<std::unique_ptr<Command>()>;
 

@@ -4,7 +4,7 @@
 #include <ostream>
 #include <tuple>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "design/security.h"
 #include "engine/database_folder.h"
 #include "ops/open_database.h"
@@ -91,7 +91,7 @@ bool SaveForCommand(Context& ctx, Database& db, const std::string& path) {
   return true;
 }
 
-bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& record,
+bool RecordOption(const Arguments& args, const Database& db, std::optional<size_t>& record,
                   std::string& error) {
   auto text = args.value("--record");
   if (!text) return true;

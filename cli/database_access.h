@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "engine/record_store.h"
 #include "ops/session.h"
@@ -42,7 +42,7 @@ bool SaveForCommand(Context& ctx, Database& db, const std::string& path = "");
 
 // "--record N": `record` stays empty without the option and is N when N
 // names a record of `db`; false (with `error` set) for anything else.
-bool RecordOption(const Args& args, const Database& db, std::optional<size_t>& record,
+bool RecordOption(const Arguments& args, const Database& db, std::optional<size_t>& record,
                   std::string& error);
 
 // A field given as a slot number (0-29) or a field name; -1 when neither.

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cctype>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "platform/text_codec.h"
 
 namespace cx::cli {

@@ -8,7 +8,7 @@
 #include <ostream>
 #include <sstream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/json_output.h"
 #include "platform/locale_info.h"
@@ -21,46 +21,6 @@
 
 namespace cx::cli {
 namespace {
-
-constexpr const char* kGlobalHelp = R"(Global options (before or after the command):
-  --date-format PATTERN  short date pattern in the handheld's tokens, e.g. M/d/yyyy,
-                         dd.MMM.yy (M/MM/MMM month as a number, d/dd day, yy/yyyy year)
-  --date-sep C           date separator (default: the first character of the
-                         pattern that is not a letter)
-  --time-format PATTERN  time pattern, e.g. h:mm:ss tt (12-hour) or HH:mm:ss
-  --time-sep C           time separator (default as for dates)
-  --am TEXT, --pm TEXT   the 12-hour designators
-  --decimal C            decimal separator (a value other than "." makes numbers
-                         use ",")
-                         Defaults for all of these come from the system locale.
-  --password TEXT        the password of a protected database (other users of
-                         the machine can read it in the process list)
-  --password-file FILE   the password from the first line of FILE, or of
-                         standard input with -; without either, a terminal
-                         is asked for it without echo
-  --yes, --no            the answer to every question the command asks; without
-                         one, questions are asked on the terminal, or (with no
-                         terminal) refused, and the command changes nothing
-  --json                 machine-readable output: the result as one JSON
-                         document; a failure as {"error", "exitCode"} on
-                         stderr; commands with no result refuse it (exit 2)
-  --help [COMMAND]       this text, or a command's own (also: help [COMMAND])
-  -V, --version          the program's version
-
-Exit codes: 0 success, 1 the operation failed (the message is on stderr),
-2 usage error.
-)";
-
-bool TakeValue(const std::vector<std::string>& args, size_t& i, std::string& value) {
-  const std::string& a = args[i];
-  if (size_t eq = a.find('='); eq != std::string::npos) {
-    value = a.substr(eq + 1);
-    return true;
-  }
-  if (i + 1 >= args.size()) return false;
-  value = args[++i];
-  return true;
-}
 
 // The first line of a file (or of standard input for "-"), without its
 // line end; nothing when it cannot be read. An empty file is an empty
@@ -83,6 +43,53 @@ std::optional<std::string> ReadPasswordLine(const std::string& file) {
 
 }  // namespace
 
+namespace {
+
+void DeclareGlobals(Syntax& s) {
+  s.Option("--date-format", "PATTERN",
+             "short date pattern in the handheld's tokens, e.g. M/d/yyyy, dd.MMM.yy "
+             "(M/MM/MMM month as a number, d/dd day, yy/yyyy year)",
+             Take::kLast)
+        .Option("--date-sep", "C",
+                "date separator (default: the first character of the pattern that is not a letter)",
+                Take::kLast)
+        .Option("--time-format", "PATTERN", "time pattern, e.g. h:mm:ss tt (12-hour) or HH:mm:ss",
+                Take::kLast)
+        .Option("--time-sep", "C", "time separator (default as for dates)", Take::kLast)
+        .Option("--am", "TEXT", "the 12-hour designator before noon", Take::kLast)
+        .Option("--pm", "TEXT", "the 12-hour designator after noon", Take::kLast)
+        .Option("--decimal", "C",
+                "decimal separator (a value other than \".\" makes numbers use \",\")\n"
+                "Defaults for all of these come from the system locale.",
+                Take::kLast)
+        .Option("--password", "TEXT",
+                "the password of a protected database (other users of the machine can read it in "
+                "the process list)",
+                Take::kLast)
+        .Option("--password-file", "FILE",
+                "the password from the first line of FILE, or of standard input with -; without "
+                "either, a terminal is asked for it without echo",
+                Take::kLast)
+        .Flag("--yes", "the answer Yes to every question the command asks")
+        .Flag("--no",
+              "the answer No to every question; without either, questions are asked on the "
+              "terminal, or (with no terminal) refused, and the command changes nothing")
+        .Flag("--json",
+              "machine-readable output: the result as one JSON document; a failure as "
+              "{\"error\", \"exitCode\"} on stderr; commands with no result refuse it (exit 2)")
+        .Flag("-h,--help", "this text, or with a COMMAND its own (also: help [COMMAND])")
+        .Flag("-V,--version", "the program's version");
+}
+
+}  // namespace
+
+const Syntax& GlobalSyntax() {
+  static Syntax syntax;
+  static const bool declared = (DeclareGlobals(syntax), true);
+  (void)declared;
+  return syntax;
+}
+
 std::string GeneralHelp() {
   std::ostringstream s;
   s << "Usage: cardovex-cli [global options] COMMAND [arguments]\n\n"
@@ -92,7 +99,11 @@ std::string GeneralHelp() {
     s << "  " << name << std::string(name.size() < 16 ? 16 - name.size() : 1, ' ') << c->summary()
       << "\n";
   }
-  s << "\n" << kGlobalHelp << "\n'cardovex-cli --help COMMAND' shows a command's arguments.\n";
+  s << "\nGlobal options (before or after the command):\n"
+    << GlobalSyntax().OptionList()
+    << "\nExit codes: 0 success, 1 the operation failed (the message is on stderr),\n"
+       "2 usage error.\n"
+    << "\n'cardovex-cli --help COMMAND' shows a command's arguments.\n";
   return s.str();
 }
 
@@ -105,104 +116,82 @@ int RunCli(const std::vector<std::string>& args, std::ostream& out, std::ostream
 
 static int RunCommandLine(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
                           CliUi& ui) {
-  LocaleInfo locale = SystemLocaleInfo();
-  std::string dateSep, timeSep, password;
-  bool dateSepGiven = false, timeSepGiven = false, passwordGiven = false, json = false, help = false;
-  std::optional<bool> answer;
+  // The global options are taken wherever they stand before "--"; the rest
+  // (the command's name, its arguments, "--" and what follows it) keeps
+  // its order for the command's own parser.
+  Arguments global;
   std::vector<std::string> rest;
-
-  for (size_t i = 0; i < args.size(); ++i) {
-    const std::string& a = args[i];
-    // After "--" nothing is an option, global or not: the command's own
-    // parser gets the marker and the arguments behind it as they are.
-    if (a == "--") {
-      rest.insert(rest.end(), args.begin() + static_cast<std::ptrdiff_t>(i), args.end());
-      break;
-    }
-    std::string name = a.substr(0, a.find('='));
-    std::string value;
-    auto need = [&](std::string& into) {
-      if (!TakeValue(args, i, into)) {
-        err << "cardovex-cli: option " << name << " needs a value\n";
-        return false;
-      }
-      return true;
-    };
-    if (name == "--date-format") {
-      if (!need(value)) return kExitUsage;
-      locale.shortDate = Utf8ToCp1252(value);
-      if (!dateSepGiven) locale.dateSeparator = FirstSeparator(locale.shortDate, '/');
-    } else if (name == "--date-sep") {
-      if (!need(dateSep)) return kExitUsage;
-      dateSepGiven = true;
-    } else if (name == "--time-format") {
-      if (!need(value)) return kExitUsage;
-      locale.timeFormat = Utf8ToCp1252(value);
-      if (!timeSepGiven) locale.timeSeparator = FirstSeparator(locale.timeFormat, ':');
-    } else if (name == "--time-sep") {
-      if (!need(timeSep)) return kExitUsage;
-      timeSepGiven = true;
-    } else if (name == "--am") {
-      if (!need(value)) return kExitUsage;
-      locale.am = Utf8ToCp1252(value);
-    } else if (name == "--pm") {
-      if (!need(value)) return kExitUsage;
-      locale.pm = Utf8ToCp1252(value);
-    } else if (name == "--decimal") {
-      if (!need(value)) return kExitUsage;
-      if (value.size() != 1) {
-        err << "cardovex-cli: --decimal takes one character\n";
-        return kExitUsage;
-      }
-      locale.decimalSeparator = value[0];
-    } else if (name == "--password") {
-      if (!need(password)) return kExitUsage;
-      std::string stored, error;
-      if (!ToStoredText(password, "--password", stored, error)) {
-        err << "cardovex-cli: " << error << "\n";
-        return kExitUsage;
-      }
-      password = std::move(stored);
-      passwordGiven = true;
-    } else if (name == "--password-file") {
-      std::string file;
-      if (!need(file)) return kExitUsage;
-      std::optional<std::string> line = ReadPasswordLine(file);
-      if (!line) {
-        err << "cardovex-cli: --password-file: cannot read " << (file == "-" ? "standard input" : file)
-            << (errno ? std::string(": ") + std::strerror(errno) : std::string()) << "\n";
-        return kExitFailed;
-      }
-      std::string stored, error;
-      if (!ToStoredText(*line, "the password in " + file, stored, error)) {
-        err << "cardovex-cli: " << error << "\n";
-        return kExitUsage;
-      }
-      password = std::move(stored);
-      passwordGiven = true;
-    } else if (a == "--json") {
-      json = true;
-    } else if (a == "--yes") {
-      answer = true;
-    } else if (a == "--no") {
-      answer = false;
-    } else if (a == "--help" || a == "-h") {
-      help = true;
-    } else if (a == "--version" || a == "-V") {
-      out << "cardovex-cli " << CARDOVEX_VERSION << "\n";
-      return kExitOk;
-    } else {
-      rest.push_back(a);
-    }
+  std::string problem;
+  if (!GlobalSyntax().ParseKnown(args, global, rest, problem)) {
+    err << "cardovex-cli: " << problem << "\n";
+    return kExitUsage;
   }
-  for (const auto* sep : {&dateSep, &timeSep}) {
-    if (!sep->empty() && Utf8ToCp1252(*sep).size() != 1) {
+  if (global.has("--version")) {
+    out << "cardovex-cli " << CARDOVEX_VERSION << "\n";
+    return kExitOk;
+  }
+  LocaleInfo locale = SystemLocaleInfo();
+  if (auto v = global.value("--date-format")) {
+    locale.shortDate = Utf8ToCp1252(*v);
+    locale.dateSeparator = FirstSeparator(locale.shortDate, '/');
+  }
+  if (auto v = global.value("--time-format")) {
+    locale.timeFormat = Utf8ToCp1252(*v);
+    locale.timeSeparator = FirstSeparator(locale.timeFormat, ':');
+  }
+  if (auto v = global.value("--am")) locale.am = Utf8ToCp1252(*v);
+  if (auto v = global.value("--pm")) locale.pm = Utf8ToCp1252(*v);
+  if (auto v = global.value("--decimal")) {
+    if (v->size() != 1) {
+      err << "cardovex-cli: --decimal takes one character\n";
+      return kExitUsage;
+    }
+    locale.decimalSeparator = (*v)[0];
+  }
+  for (const char* option : {"--date-sep", "--time-sep"}) {
+    std::optional<std::string> sep = global.value(option);
+    if (!sep) continue;
+    const std::string c = Utf8ToCp1252(*sep);
+    if (c.size() > 1) {
       err << "cardovex-cli: a separator is one character\n";
       return kExitUsage;
     }
+    char& into = option == std::string("--date-sep") ? locale.dateSeparator : locale.timeSeparator;
+    into = c.empty() ? (option == std::string("--date-sep") ? '/' : ':') : c[0];
   }
-  if (dateSepGiven) locale.dateSeparator = dateSep.empty() ? '/' : Utf8ToCp1252(dateSep)[0];
-  if (timeSepGiven) locale.timeSeparator = timeSep.empty() ? ':' : Utf8ToCp1252(timeSep)[0];
+  if (global.has("--password") && global.has("--password-file")) {
+    err << "cardovex-cli: --password and --password-file exclude each other\n";
+    return kExitUsage;
+  }
+  if (global.has("--yes") && global.has("--no")) {
+    err << "cardovex-cli: --yes and --no exclude each other\n";
+    return kExitUsage;
+  }
+  std::string password;
+  const bool passwordGiven = global.has("--password") || global.has("--password-file");
+  if (auto given = global.value("--password")) {
+    std::string error;
+    if (!ToStoredText(*given, "--password", password, error)) {
+      err << "cardovex-cli: " << error << "\n";
+      return kExitUsage;
+    }
+  } else if (auto file = global.value("--password-file")) {
+    std::optional<std::string> line = ReadPasswordLine(*file);
+    if (!line) {
+      err << "cardovex-cli: --password-file: cannot read " << (*file == "-" ? "standard input" : *file)
+          << (errno ? std::string(": ") + std::strerror(errno) : std::string()) << "\n";
+      return kExitFailed;
+    }
+    std::string error;
+    if (!ToStoredText(*line, "the password in " + *file, password, error)) {
+      err << "cardovex-cli: " << error << "\n";
+      return kExitUsage;
+    }
+  }
+  std::optional<bool> answer;
+  if (global.has("--yes")) answer = true;
+  if (global.has("--no")) answer = false;
+  bool help = global.has("--help");
 
   if (rest.empty()) {
     (help ? out : err) << GeneralHelp();
@@ -233,11 +222,16 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
   }
   ui.SetAnswer(answer);
   ui.SetPassword(password, passwordGiven);
-  Context ctx{locale, password, json, out, err, ui};
+  Context ctx{locale, password, global.has("--json"), out, err, ui};
   ctx.command = command->name();
   ui.SetCommand(ctx.command);
-  std::vector<std::string> commandArgs(rest.begin() + 1, rest.end());
-  int code = command->Run(ctx, commandArgs);
+  Syntax syntax(command->name());
+  command->Declare(syntax);
+  Arguments arguments;
+  if (!syntax.Parse(std::vector<std::string>(rest.begin() + 1, rest.end()), arguments, problem)) {
+    return UsageError(ctx, *command, problem);
+  }
+  int code = command->Run(ctx, arguments);
   if (code == kExitOk && ui.unanswered()) code = kExitFailed;
   // Output that never arrived (a full disk, a closed pipe) is a failure,
   // however well the rest went.

@@ -74,7 +74,9 @@ std::string CamelCaseKey(std::string_view label) {
 
 int WithJsonErrors(const std::vector<std::string>& args, std::ostream& err,
                    const std::function<int()>& run) {
-  if (std::find(args.begin(), args.end(), "--json") == args.end()) return run();
+  // After "--" a "--json" is an argument, not the option.
+  const auto end = std::find(args.begin(), args.end(), "--");
+  if (std::find(args.begin(), end, "--json") == end) return run();
   HoldingBuffer holding(err.rdbuf());
   std::streambuf* original = err.rdbuf(&holding);
   // std::cerr flushes after every output, which would pass everything on.

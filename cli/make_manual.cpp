@@ -1,5 +1,5 @@
 // Build-time helper: writes cardovex-cli.1 and the bash completion script
-// into the folder given, from the help texts of the commands linked in.
+// into the folder given, from the declarations of the commands linked in.
 #include <fstream>
 #include <iostream>
 #include <string>

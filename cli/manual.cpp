@@ -1,22 +1,36 @@
 #include "cli/manual.h"
 
 #include <algorithm>
-#include <cctype>
 #include <sstream>
+#include <vector>
 
 #include "cli/command.h"
 #include "cli/global_options.h"
+#include "cli/syntax.h"
 
 namespace cx::cli {
 namespace {
 
-bool OptionChar(char c) {
-  return std::islower(static_cast<unsigned char>(c)) || std::isdigit(static_cast<unsigned char>(c)) ||
-         c == '-';
-}
-
 void AddOnce(std::vector<std::string>& list, const std::string& item) {
   if (std::find(list.begin(), list.end(), item) == list.end()) list.push_back(item);
+}
+
+// The options a command (or the global declaration) takes, and among them
+// those that take a value.
+struct Options {
+  std::vector<std::string> all;
+  std::vector<std::string> withValue;
+};
+
+Options DeclaredOptions(const Syntax& syntax) {
+  Options found;
+  for (const Syntax::OptionInfo& o : syntax.options()) {
+    for (const std::string& name : o.names) {
+      AddOnce(found.all, name);
+      if (!o.value.empty()) AddOnce(found.withValue, name);
+    }
+  }
+  return found;
 }
 
 // Text for roff: a backslash would start an escape and a line opening with
@@ -54,26 +68,6 @@ std::string Words(const std::vector<std::string>& words) {
 
 }  // namespace
 
-HelpOptions OptionsInHelp(const std::string& help) {
-  HelpOptions found;
-  for (size_t at = help.find("--"); at != std::string::npos; at = help.find("--", at + 2)) {
-    if (at > 0 && (OptionChar(help[at - 1]) || help[at - 1] == '\'')) continue;
-    size_t end = at + 2;
-    while (end < help.size() && OptionChar(help[end])) ++end;
-    if (end == at + 2 || !std::islower(static_cast<unsigned char>(help[at + 2]))) continue;
-    // "--filterN" stands for a family of options, none of them named.
-    if (end < help.size() && std::isupper(static_cast<unsigned char>(help[end]))) continue;
-    const std::string name = help.substr(at, end - at);
-    AddOnce(found.all, name);
-    // A value is written in capitals after a blank or "=": "--name FILE".
-    if (end + 1 < help.size() && (help[end] == ' ' || help[end] == '=') &&
-        std::isupper(static_cast<unsigned char>(help[end + 1]))) {
-      AddOnce(found.withValue, name);
-    }
-    at = end - 2;
-  }
-  return found;
-}
 
 std::string ManPage(const std::string& version) {
   std::ostringstream s;
@@ -94,23 +88,24 @@ std::string ManPage(const std::string& version) {
   return s.str();
 }
 
+
 std::string BashCompletion() {
-  const HelpOptions global = OptionsInHelp(GeneralHelp());
+  const Options global = DeclaredOptions(GlobalSyntax());
   std::vector<std::string> names;
   std::ostringstream cases;
   std::vector<std::string> withValue = global.withValue;
   for (const auto& c : Registry::Instance().All()) {
     names.push_back(c->name());
-    const HelpOptions own = OptionsInHelp(c->help());
+    Syntax syntax(c->name());
+    c->Declare(syntax);
+    const Options own = DeclaredOptions(syntax);
     cases << "    " << c->name() << ") opts=" << Words(own.all) << " ;;\n";
     for (const auto& o : own.withValue) AddOnce(withValue, o);
   }
   names.push_back("help");
-  // "--help" takes a command name, offered below like any other word.
-  withValue.erase(std::remove(withValue.begin(), withValue.end(), "--help"), withValue.end());
 
   std::ostringstream s;
-  s << "# bash completion for cardovex-cli (generated from its help texts)\n"
+  s << "# bash completion for cardovex-cli (generated from its declarations)\n"
     << "_cardovex_cli() {\n"
     << "  local cur=${COMP_WORDS[COMP_CWORD]} prev=${COMP_WORDS[COMP_CWORD-1]}\n"
     << "  local global=" << Words(global.all) << "\n"

@@ -1,19 +1,12 @@
-// The manual page and the bash completion script, both made from the help
-// texts the tool prints, so that neither can drift from what it accepts.
+// The manual page and the bash completion script, both made from the
+// commands' declarations (the page through the help texts they give), so
+// that neither can drift from what the tool accepts.
 #pragma once
 
 #include <string>
-#include <vector>
 
 namespace cx::cli {
 
-// The long options a help text names, in the order they first appear, and
-// among them those written with a value ("--name VALUE" or "--name=VALUE").
-struct HelpOptions {
-  std::vector<std::string> all;
-  std::vector<std::string> withValue;
-};
-HelpOptions OptionsInHelp(const std::string& help);
 
 // The page in man(7) markup.
 std::string ManPage(const std::string& version);

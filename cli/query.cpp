@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/database_access.h"
 #include "ops/sort.h"
 #include "ops/sort_keys.h"

@@ -3,7 +3,7 @@
 #include <set>
 
 #include "app/pickers.h"
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
 #include "engine/dates.h"

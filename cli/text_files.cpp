@@ -22,7 +22,13 @@ class StreamSink : public TextSink {
 
 }  // namespace
 
-bool EncodingOption(Context& ctx, const Command& command, const Args& args, TextEncoding& encoding,
+void DeclareEncoding(Syntax& syntax) {
+  syntax.Option("--encoding", "E",
+                "the text file's encoding: utf-8 (the default) or windows-1252 (the bytes the "
+                "database holds)");
+}
+
+bool EncodingOption(Context& ctx, const Command& command, const Arguments& args, TextEncoding& encoding,
                     int& code) {
   encoding = TextEncoding::kUtf8;
   std::optional<std::string> name = args.value("--encoding");

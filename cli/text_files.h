@@ -6,21 +6,21 @@
 #include <functional>
 #include <string>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
+#include "cli/syntax.h"
 #include "ops/text_encoding.h"
 #include "ops/text_sink.h"
 #include "platform/status.h"
 
 namespace cx::cli {
 
-inline constexpr const char* kEncodingHelp =
-    "  --encoding E  the text file's encoding: utf-8 (the default) or\n"
-    "                windows-1252 (the bytes the database holds)\n";
+// Declares --encoding.
+void DeclareEncoding(Syntax& syntax);
 
 // Reads --encoding. False after a usage error (exit 2 in `code`) for a name
 // that is neither.
-bool EncodingOption(Context& ctx, const Command& command, const Args& args, TextEncoding& encoding,
+bool EncodingOption(Context& ctx, const Command& command, const Arguments& args, TextEncoding& encoding,
                     int& code);
 
 // Writes what `produce` puts into its sink to `path` ("-": standard output)

@@ -2,7 +2,7 @@
 // typed in as the record editor takes it, then stored as its OK stores it.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/command_document.h"
 #include "cli/commands/design_common.h"
@@ -58,21 +58,19 @@ class AddCommand : public Command {
  public:
   std::string name() const override { return "add"; }
   std::string summary() const override { return "add a record with the values given"; }
-  std::string help() const override {
-    return std::string(
-               "Usage: cardovex-cli [--json] [--password PW] add FILE [FIELD=VALUE...]\n"
-               "Adds a record (needs the \"Add Records\" access). Fields not named get a\n"
-               "new record's defaults: the Pop-Up default entry, today for \"Current\n"
-               "Date\" dates, new numbers for Unique and Link fields.\n") +
-           kValueHelp +
-           "Prints the new record's index (with --json: {\"index\": N}).\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json", "--password"})
+        .Positional("FILE")
+        .Positional("FIELD=VALUE", kAnyNumber)
+        .About(std::string("Adds a record (needs the \"Add Records\" access). Fields not named get a\n"
+                           "new record's defaults: the Pop-Up default entry, today for \"Current\n"
+                           "Date\" dates, new numbers for Unique and Link fields.\n") +
+               kValueHelp + "Prints the new record's index (with --json: {\"index\": N}).\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
-    if (p.empty()) return UsageError(ctx, *this, "expected FILE");
     Database db;
     if (!OpenForCommand(ctx, p[0], db)) return kExitFailed;
     std::vector<FieldAssignment> values;
@@ -95,24 +93,24 @@ class EditCommand : public Command {
  public:
   std::string name() const override { return "edit"; }
   std::string summary() const override { return "change the named fields of one record"; }
-  std::string help() const override {
-    return std::string(
-               "Usage: cardovex-cli [--json] [--password PW] edit FILE INDEX FIELD=VALUE...\n"
-               "Changes the named fields of record INDEX (as 'records' numbers them;\n"
-               "needs the \"Edit Records\" access); every other value of the record stays\n"
-               "as it was, byte for byte. Date and time fields set to be filled in when a\n"
-               "record is modified are filled in.\n") +
-           kValueHelp +
-           "Prints the record's index afterwards, which the sort may have moved (with\n"
-           "--json: {\"index\": N}). Values equal to those stored change nothing and\n"
-           "FILE is not written.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json", "--password"})
+        .Positional("FILE")
+        .Positional("INDEX")
+        .Positional("FIELD=VALUE", kOneOrMore)
+        .About(std::string("Changes the named fields of record INDEX (as 'records' numbers them;\n"
+                           "needs the \"Edit Records\" access); every other value of the record stays\n"
+                           "as it was, byte for byte. Date and time fields set to be filled in when a\n"
+                           "record is modified are filled in.\n") +
+               kValueHelp +
+               "Prints the record's index afterwards, which the sort may have moved (with\n"
+               "--json: {\"index\": N}). Values equal to those stored change nothing and\n"
+               "FILE is not written.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
-    if (p.size() < 3) return UsageError(ctx, *this, "expected FILE INDEX FIELD=VALUE...");
     const std::optional<long> n = ParseNumber(p[1]);
     if (!n || *n < 0) return UsageError(ctx, *this, "INDEX is a record index (0, 1, ...)");
     Database db;

@@ -1,7 +1,7 @@
 // author FILE [--author TEXT] [--comments TEXT]: the Author Information.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -16,18 +16,17 @@ class AuthorCommand : public Command {
  public:
   std::string name() const override { return "author"; }
   std::string summary() const override { return "show or set the author and comments"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] author FILE [--author TEXT] [--comments TEXT]\n"
-           "Without options, shows the author and comments (with --json as an object).\n"
-           "  --author TEXT    at most 39 characters\n"
-           "  --comments TEXT  at most 69 characters\n"
-           "Changes need the \"DB Properties\" access.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .About("Without options, shows the author and comments (with --json as an object).\n")
+        .Option("--author", "TEXT", "at most 39 characters")
+        .Option("--comments", "TEXT", "at most 69 characters")
+        .Notes("Changes need the \"DB Properties\" access.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--author", "--comments"}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+
+  int Run(Context& ctx, const Arguments& args) override {
     AuthorInfo info;
     if (!args.has("--author") && !args.has("--comments")) {
       DatabaseHead head;

@@ -2,7 +2,7 @@
 // in view to another installation over OBEX.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json_output.h"
@@ -17,21 +17,22 @@ class BeamCommand : public Command {
  public:
   std::string name() const override { return "beam"; }
   std::string summary() const override { return "send a database or records over OBEX (TCP)"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli beam FILE [--to HOST[:PORT] ...] [--record N | --records]\n"
-           "                         [--wait SECONDS]\n"
-           "Sends the whole database (at most 65535 bytes), its record N (index in table\n"
-           "order, from 0) or the records in view to another device's OBEX receiver over\n"
-           "TCP (default port 650). Without --to, the peers of the BeamPeers setting are\n"
-           "tried in order. Asks the database's \"Beam Data\" access check first.\n"
-           "  --wait SECONDS  how long to keep looking for a peer (default 60)\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Positional("FILE")
+        .About("Sends the whole database (at most 65535 bytes), its record N (index in table\n"
+               "order, from 0) or the records in view to another device's OBEX receiver over\n"
+               "TCP (default port 650). Without --to, the peers of the BeamPeers setting are\n"
+               "tried in order. Asks the database's \"Beam Data\" access check first.\n")
+        .Option("--to", "HOST[:PORT]", "a peer to try, in the order given", Take::kRepeatable)
+        .Option("--record", "N", "send record N alone")
+        .Flag("--records", "send the records in view")
+        .Option("--wait", "SECONDS", "how long to keep looking for a peer (default 60)")
+        .Form({"FILE", "--to", "--record|--records", "--wait"});
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {"--to", "--record", "--wait"}, {"--records"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     if (args.has("--record") && args.has("--records")) {
       return UsageError(ctx, *this, "--record and --records exclude each other");
     }

@@ -2,7 +2,6 @@
 // main view, from the command line.
 #include <ostream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/command_document.h"
 #include "cli/commands/design_common.h"
@@ -19,27 +18,26 @@ class DeleteCommand : public Command {
  public:
   std::string name() const override { return "delete"; }
   std::string summary() const override { return "delete the records within or outside the filter range, or all"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] [--yes|--no] delete FILE\n"
-           "                    --within | --outside | --all | --record INDEX\n"
-           "Deletes records and saves FILE:\n"
-           "  --within    \"All Records _Within_ Filter Range\": the records in view\n"
-           "  --outside   \"All Records _Outside_ Filter Range\": the others (none when\n"
-           "              both filters are off)\n"
-           "  --all       \"All Records\"\n"
-           "  --record INDEX   the one record INDEX (as 'records' numbers it)\n"
-           "Needs the \"Delete Records\" access. When FILE has Link fields the question\n"
-           "\"Would you like to delete the linked records also? (Y/N)\" is answered by\n"
-           "--yes (the linked records in the other databases go too, each database\n"
-           "under its own access check) or --no; without either it is asked on the\n"
-           "terminal, and with no terminal refused: nothing is deleted, exit status 1.\n"
-           "Calculated fields are brought up to date afterwards.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password", "--yes|--no"})
+        .Positional("FILE")
+        .Form({"FILE", "(--within|--outside|--all|--record)"})
+        .About("Deletes records and saves FILE:\n")
+        .Flag("--within", "\"All Records _Within_ Filter Range\": the records in view")
+        .Flag("--outside",
+              "\"All Records _Outside_ Filter Range\": the others (none when both filters are off)")
+        .Flag("--all", "\"All Records\"")
+        .Option("--record", "INDEX", "the one record INDEX (as 'records' numbers it)")
+        .Notes("Needs the \"Delete Records\" access. When FILE has Link fields the question\n"
+               "\"Would you like to delete the linked records also? (Y/N)\" is answered by\n"
+               "--yes (the linked records in the other databases go too, each database\n"
+               "under its own access check) or --no; without either it is asked on the\n"
+               "terminal, and with no terminal refused: nothing is deleted, exit status 1.\n"
+               "Calculated fields are brought up to date afterwards.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--record"}, {"--within", "--outside", "--all"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+
+  int Run(Context& ctx, const Arguments& args) override {
     const int scopes = args.has("--within") + args.has("--outside") + args.has("--all") + args.has("--record");
     if (scopes != 1) {
       return UsageError(ctx, *this, "give exactly one of --within, --outside, --all, --record");
@@ -73,7 +71,7 @@ class DeleteCommand : public Command {
  private:
   // The list's "Delete Record": the command line itself is the confirmation,
   // so only the linked-records question is asked.
-  int DeleteOne(Context& ctx, const Args& args) {
+  int DeleteOne(Context& ctx, const Arguments& args) {
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     std::optional<size_t> record;

@@ -1,5 +1,4 @@
 // export-csv FILE OUT: the records as comma-separated text.
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
@@ -14,31 +13,29 @@ class ExportCsvCommand : public Command {
  public:
   std::string name() const override { return "export-csv"; }
   std::string summary() const override { return "write the records as comma-separated text"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli export-csv FILE OUT [--quote-all] [--header] [--filtered]\n"
-           "                                [--slot-order] [--encoding E] [--force]\n"
-           "Writes one line per record, each value as the list shows it (\"No Value\"\n"
-           "where that is empty; Image columns stay empty), lines ending in LF, in\n"
-           "UTF-8. OUT '-' writes to standard output.\n"
-           "  --quote-all   quote every value (and the header's names)\n"
-           "  --header      a first line of field names\n"
-           "  --filtered    only the records in view (those that pass the filters)\n"
-           "  --slot-order  columns in field slot order instead of display order\n"
-           "  --force       write OUT even when it is a database or FILE itself\n" +
-           std::string(kEncodingHelp) +
-           "OUT is replaced only once the whole text is written; a FIFO or a device\n"
-           "named as OUT is written into.\n"
-           "Columns are the used fields. When the first field of the order is\n"
-           "Not-Used, every data line starts with a separator that the header lacks.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Positional("FILE")
+        .Positional("OUT")
+        .About("Writes one line per record, each value as the list shows it (\"No Value\"\n"
+               "where that is empty; Image columns stay empty), lines ending in LF, in\n"
+               "UTF-8. OUT '-' writes to standard output.\n")
+        .Flag("--quote-all", "quote every value (and the header's names)")
+        .Flag("--header", "a first line of field names")
+        .Flag("--filtered", "only the records in view (those that pass the filters)")
+        .Flag("--slot-order", "columns in field slot order instead of display order");
+    DeclareEncoding(syntax);
+    syntax.Flag("--force", "write OUT even when it is a database or FILE itself")
+        .Notes("OUT is replaced only once the whole text is written; a FIFO or a device\n"
+               "named as OUT is written into.\n"
+               "Columns are the used fields. When the first field of the order is\n"
+               "Not-Used, every data line starts with a separator that the header lacks.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {"--encoding"}, {"--quote-all", "--header", "--filtered", "--slot-order", "--force"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
     TextEncoding encoding;
     if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE OUT");
     const std::string& out = args.positional()[1];
     if (out != "-" && !TextTargetAllowed(ctx, args, out, args.positional()[0])) return kExitFailed;
     Database db;

@@ -14,7 +14,6 @@
 #include <set>
 #include <variant>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
@@ -256,44 +255,44 @@ class ExportSqliteCommand : public Command {
  public:
   std::string name() const override { return "export-sqlite"; }
   std::string summary() const override { return "write databases as tables of one SQLite file"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] export-sqlite FILE... OUT [--force]\n"
-           "Writes every record of each FILE into a table of the SQLite database OUT,\n"
-           "named after the database, in table order (rowid 1 is record 0). Each used\n"
-           "field but a Heading is a column, in display order, named after the field:\n"
-           "  Integer, Unique, Link, Linked   INTEGER\n"
-           "  Float                           REAL\n"
-           "  Check-Box                       INTEGER 0 or 1\n"
-           "  Text, Note, DB Popup            TEXT as stored\n"
-           "  Pop-Up                          TEXT, the entry's text\n"
-           "  Date                            TEXT YYYY-MM-DD\n"
-           "  Time                            TEXT HH:MM:SS\n"
-           "  Image                           BLOB, the picture's bytes\n"
-           "  Calculated                      REAL (decimal results), INTEGER (whole\n"
-           "                                  numbers; a time as seconds), TEXT\n"
-           "                                  YYYY-MM-DD (a date)\n"
-           "No value (\"No Value\", \"NO DATE\", \"No Time\", no picture, an empty\n"
-           "number) is NULL; a number that does not read as one keeps its text.\n"
-           "Two more tables describe the data: cardovexSchema, one row per column\n"
-           "(tableName, columnName, position, sourceFile, databaseName, slot,\n"
-           "fieldName, fieldType, sqlType, refTable, refColumn) and cardovexPopups\n"
-           "(tableName, columnName, slot, position, item) with each Pop-Up list.\n"
-           "A Link, Linked or DB Popup column's refTable and refColumn name the table\n"
-           "and column it refers to when that database is exported too: a Link's\n"
-           "linked records are those whose refColumn equals its value, e.g.\n"
-           "  SELECT * FROM Contacts JOIN Orders ON Orders.Customer = Contacts.Orders\n"
-           "Where the Link's values are distinct and every linked record has its\n"
-           "parent, the column is also declared as a foreign key (REFERENCES) to it.\n"
-           "OUT is replaced only once it is complete.\n"
-           "  --force   write OUT even when it is a database or one of the FILEs\n"
-           "With --json: {\"tables\": [{\"table\", \"file\", \"records\", \"columns\"}]}.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FILE", kOneOrMore)
+        .Positional("OUT")
+        .About("Writes every record of each FILE into a table of the SQLite database OUT,\n"
+               "named after the database, in table order (rowid 1 is record 0). Each used\n"
+               "field but a Heading is a column, in display order, named after the field:\n"
+               "  Integer, Unique, Link, Linked   INTEGER\n"
+               "  Float                           REAL\n"
+               "  Check-Box                       INTEGER 0 or 1\n"
+               "  Text, Note, DB Popup            TEXT as stored\n"
+               "  Pop-Up                          TEXT, the entry's text\n"
+               "  Date                            TEXT YYYY-MM-DD\n"
+               "  Time                            TEXT HH:MM:SS\n"
+               "  Image                           BLOB, the picture's bytes\n"
+               "  Calculated                      REAL (decimal results), INTEGER (whole\n"
+               "                                  numbers; a time as seconds), TEXT\n"
+               "                                  YYYY-MM-DD (a date)\n"
+               "No value (\"No Value\", \"NO DATE\", \"No Time\", no picture, an empty\n"
+               "number) is NULL; a number that does not read as one keeps its text.\n"
+               "Two more tables describe the data: cardovexSchema, one row per column\n"
+               "(tableName, columnName, position, sourceFile, databaseName, slot,\n"
+               "fieldName, fieldType, sqlType, refTable, refColumn) and cardovexPopups\n"
+               "(tableName, columnName, slot, position, item) with each Pop-Up list.\n"
+               "A Link, Linked or DB Popup column's refTable and refColumn name the table\n"
+               "and column it refers to when that database is exported too: a Link's\n"
+               "linked records are those whose refColumn equals its value, e.g.\n"
+               "  SELECT * FROM Contacts JOIN Orders ON Orders.Customer = Contacts.Orders\n"
+               "Where the Link's values are distinct and every linked record has its\n"
+               "parent, the column is also declared as a foreign key (REFERENCES) to it.\n"
+               "OUT is replaced only once it is complete.\n")
+        .Flag("--force", "write OUT even when it is a database or one of the FILEs")
+        .Notes("With --json: {\"tables\": [{\"table\", \"file\", \"records\", \"columns\"}]}.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--force"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
-    if (p.size() < 2) return UsageError(ctx, *this, "expected FILE... OUT");
     const std::string out = p.back();
     const std::vector<std::string> files(p.begin(), p.end() - 1);
     if (out == "-") return UsageError(ctx, *this, "OUT must be a file: an SQLite database is not text");

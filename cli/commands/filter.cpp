@@ -4,7 +4,6 @@
 #include <ostream>
 #include <utility>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
@@ -31,45 +30,45 @@ class FilterCommand : public Command {
  public:
   std::string name() const override { return "filter"; }
   std::string summary() const override { return "show or set the two filters"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] filter FILE\n"
-           "       cardovex-cli filter FILE [--filter1 COND] [--filter2 COND] [--not1] [--not2]\n"
-           "                    [--or]\n"
-           "       cardovex-cli filter FILE --off\n"
-           "Without options: shows both filters and how many records are in view.\n"
-           "Otherwise stores the filters as the Edit Filters dialog's OK does, saves FILE\n"
-           "and shows the result. The command line is the whole dialog: a filter not\n"
-           "named is switched off (its settings are kept), NOT and OR are off unless\n"
-           "given.\n"
-           "  --filter1 COND, --filter2 COND   switch the filter on with COND\n"
-           "  --not1, --not2   the filter's \"NOT\" (needs its --filterN)\n"
-           "  --or             combine the filters with OR (otherwise AND)\n"
-           "  --off            switch both filters off, changing nothing else\n"
-           "COND is FIELD=VALUE, FIELD a slot number (0-29) or a field name, VALUE by\n"
-           "the field's type:\n"
-           "  Text, Note, DB Popup, Linked   the \"Must Contain\" text, case ignored\n"
-           "                                 (empty: only records whose value is empty)\n"
-           "  Integer, Unique, Float and numeric Calculated   LOW..HIGH, e.g. 10..20\n"
-           "                                 or -1.5..2.25 (\".\" as the point)\n"
-           "  Date, Time and date or time Calculated   LOW..HIGH in the date or time\n"
-           "                                 format of the global options\n"
-           "                                 (--date-format, --time-format)\n"
-           "  Pop-Up                         an entry's text, or \"No Value\" (on filter\n"
-           "                                 2 that matches no record)\n"
-           "  Check-Box                      1 (checked) or 0 (not checked)\n"
-           "'records FILE' then lists exactly the records in view.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FILE")
+        .Form({"FILE"})
+        .Form({"FILE", "--filter1", "--filter2", "--not1", "--not2", "--or"})
+        .Form({"FILE", "(--off)"})
+        .About("Without options: shows both filters and how many records are in view.\n"
+               "Otherwise stores the filters as the Edit Filters dialog's OK does, saves FILE\n"
+               "and shows the result. The command line is the whole dialog: a filter not\n"
+               "named is switched off (its settings are kept), NOT and OR are off unless\n"
+               "given.\n")
+        .Option("--filter1", "COND", "switch filter 1 on with COND")
+        .Option("--filter2", "COND", "switch filter 2 on with COND")
+        .Flag("--not1", "filter 1's \"NOT\" (needs --filter1)")
+        .Flag("--not2", "filter 2's \"NOT\" (needs --filter2)")
+        .Flag("--or", "combine the filters with OR (otherwise AND)")
+        .Flag("--off", "switch both filters off, changing nothing else")
+        .Notes("COND is FIELD=VALUE, FIELD a slot number (0-29) or a field name, VALUE by\n"
+               "the field's type:\n"
+               "  Text, Note, DB Popup, Linked   the \"Must Contain\" text, case ignored\n"
+               "                                 (empty: only records whose value is empty)\n"
+               "  Integer, Unique, Float and numeric Calculated   LOW..HIGH, e.g. 10..20\n"
+               "                                 or -1.5..2.25 (\".\" as the point)\n"
+               "  Date, Time and date or time Calculated   LOW..HIGH in the date or time\n"
+               "                                 format of the global options\n"
+               "                                 (--date-format, --time-format)\n"
+               "  Pop-Up                         an entry's text, or \"No Value\" (on filter\n"
+               "                                 2 that matches no record)\n"
+               "  Check-Box                      1 (checked) or 0 (not checked)\n"
+               "'records FILE' then lists exactly the records in view.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--filter1", "--filter2"}, {"--not1", "--not2", "--or", "--off"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+
+  int Run(Context& ctx, const Arguments& args) override {
     const bool setting = args.has("--filter1") || args.has("--filter2") || args.has("--not1") ||
                          args.has("--not2") || args.has("--or");
     if (args.has("--off") && setting) return UsageError(ctx, *this, "--off goes alone");
     for (const char* k : {"1", "2"}) {
       const std::string filter = std::string("--filter") + k, negate = std::string("--not") + k;
-      if (args.values(filter).size() > 1) return UsageError(ctx, *this, filter + " given twice");
       if (args.has(negate) && !args.has(filter)) return UsageError(ctx, *this, negate + " needs " + filter);
     }
     Database db;

@@ -5,7 +5,7 @@
 
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
@@ -32,35 +32,34 @@ class FindCommand : public Command {
  public:
   std::string name() const override { return "find"; }
   std::string summary() const override { return "search the records in view for a text"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] find FILE TEXT [--field F] [--case-sensitive]\n"
-           "                    [--begins-with] [--records]\n"
-           "Stores the search settings in FILE as the Search Database dialog does and\n"
-           "saves it (unless FILE is read-only), searches from the first record, then repeats the find until\n"
-           "nothing more is found, and prints every hit in table order.\n"
-           "  --field F          search only field F (slot number 0-29 or name);\n"
-           "                     default \"Search All Fields\"\n"
-           "  --case-sensitive   letters must match in case (otherwise A-Z match\n"
-           "                     either case)\n"
-           "  --begins-with      the field's text must begin with TEXT\n"
-           "  --records          print the records hit, as 'records' prints them,\n"
-           "                     instead of one line per hit\n"
-           "Only the records in view (those that pass the filters) are searched, each\n"
-           "field as the list shows it. Integer and Unique fields match only a TEXT of\n"
-           "digits; a Check-Box matches \"1\" when checked and \"0\" when not.\n"
-           "Each repeat starts at field 0 of the record after the last hit, so a\n"
-           "record is reported once, with its first matching field. A search never\n"
-           "starts at the last record: when the previous hit was the record before\n"
-           "it, the last record is not searched.\n"
-           "Output: one \"INDEX<TAB>SLOT<TAB>FIELD NAME\" line per hit; with --json\n"
-           "[{\"index\": N, \"slot\": S}, ...]. The search ends with \"Not Found in\n"
-           "Database!\" on stderr. Exit status 0 when there was a hit, 1 when none.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FILE")
+        .Positional("TEXT")
+        .About("Stores the search settings in FILE as the Search Database dialog does and\n"
+               "saves it (unless FILE is read-only), searches from the first record, then\n"
+               "repeats the find until nothing more is found, and prints every hit in table\n"
+               "order.\n")
+        .Option("--field", "F",
+                "search only field F (slot number 0-29 or name); default \"Search All Fields\"")
+        .Flag("--case-sensitive", "letters must match in case (otherwise A-Z match either case)")
+        .Flag("--begins-with", "the field's text must begin with TEXT")
+        .Flag("--records",
+              "print the records hit, as 'records' prints them, instead of one line per hit")
+        .Notes("Only the records in view (those that pass the filters) are searched, each\n"
+               "field as the list shows it. Integer and Unique fields match only a TEXT of\n"
+               "digits; a Check-Box matches \"1\" when checked and \"0\" when not.\n"
+               "Each repeat starts at field 0 of the record after the last hit, so a\n"
+               "record is reported once, with its first matching field. A search never\n"
+               "starts at the last record: when the previous hit was the record before\n"
+               "it, the last record is not searched.\n"
+               "Output: one \"INDEX<TAB>SLOT<TAB>FIELD NAME\" line per hit; with --json\n"
+               "[{\"index\": N, \"slot\": S}, ...]. The search ends with \"Not Found in\n"
+               "Database!\" on stderr. Exit status 0 when there was a hit, 1 when none.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--field"}, {"--case-sensitive", "--begins-with", "--records"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TEXT");
+
+  int Run(Context& ctx, const Arguments& args) override {
     SearchSettings search;
     std::string error;
     if (!ToStoredText(args.positional()[1], "TEXT", search.text, error)) {

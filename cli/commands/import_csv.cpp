@@ -1,7 +1,6 @@
 // import-csv FILE IN: appends one record per line of a CSV file.
 #include <ostream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -17,35 +16,36 @@ class ImportCsvCommand : public Command {
  public:
   std::string name() const override { return "import-csv"; }
   std::string summary() const override { return "append the records of a CSV file"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] import-csv FILE IN [--by-slot] [--strict]\n"
-           "                                                  [--header] [--encoding E]\n"
-           "Appends one record per line of IN (UTF-8 text, a byte-order mark allowed;\n"
-           "'-' reads standard input) after the existing records and saves FILE.\n"
-           "Column n goes to the nth used field of the display order.\n"
-           "  --header    the first line names the columns: it is skipped\n"
-           "  --by-slot   column n goes to field slot n instead\n"
-           "  --strict    refuse the whole file (importing nothing) when any value would\n"
-           "              not be stored as given\n" +
-           std::string(kEncodingHelp) +
-           "A UTF-8 file holding characters that Windows-1252 cannot hold is refused\n"
-           "(nothing is imported); stderr names them with their lines.\n"
-           "Values convert by the field's type: dates and times through the date and\n"
-           "time patterns of the global options (times keep hours and minutes), Pop-Up\n"
-           "texts are found in the field's list or appended to it while it holds fewer\n"
-           "than 60 entries, an empty Unique column gets the next unique number.\n"
-           "A file with more lines than the database has room for is refused.\n"
-           "Values that cannot be stored as given (text in a number, check-box, date or\n"
-           "time column, a value longer than its field, a new Pop-Up text for a full\n"
-           "list, a quote never closed) are stored by those rules all the same; stderr\n"
-           "tells how many lines held them, and the first ones by line number.\n"
-           "Needs the \"Add Records\" access.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .Positional("IN")
+        .About("Appends one record per line of IN (UTF-8 text, a byte-order mark allowed;\n"
+               "'-' reads standard input) after the existing records and saves FILE.\n"
+               "Column n goes to the nth used field of the display order.\n")
+        .Flag("--header", "the first line names the columns: it is skipped")
+        .Flag("--by-slot", "column n goes to field slot n instead")
+        .Flag("--strict",
+              "refuse the whole file (importing nothing) when any value would not be stored as "
+              "given");
+    DeclareEncoding(syntax);
+    syntax.Notes(
+        "A UTF-8 file holding characters that Windows-1252 cannot hold is refused\n"
+        "(nothing is imported); stderr names them with their lines.\n"
+        "Values convert by the field's type: dates and times through the date and\n"
+        "time patterns of the global options (times keep hours and minutes), Pop-Up\n"
+        "texts are found in the field's list or appended to it while it holds fewer\n"
+        "than 60 entries, an empty Unique column gets the next unique number.\n"
+        "A file with more lines than the database has room for is refused.\n"
+        "Values that cannot be stored as given (text in a number, check-box, date or\n"
+        "time column, a value longer than its field, a new Pop-Up text for a full\n"
+        "list, a quote never closed) are stored by those rules all the same; stderr\n"
+        "tells how many lines held them, and the first ones by line number.\n"
+        "Needs the \"Add Records\" access.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--encoding"}, {"--by-slot", "--strict", "--header"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE IN");
+
+  int Run(Context& ctx, const Arguments& args) override {
     TextEncoding encoding;
     if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
     const std::string& in = args.positional()[1];

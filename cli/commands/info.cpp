@@ -2,7 +2,6 @@
 // database.
 #include <ostream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json.h"
@@ -119,15 +118,14 @@ class InfoCommand : public Command {
  public:
   std::string name() const override { return "info"; }
   std::string summary() const override { return "show a database's header, fields and settings"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] info FILE\n"
-           "Shows the database's name, type and creator, record count, fields, display\n"
-           "order, sort keys, popup lists, access levels, author and comments.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FILE")
+        .About("Shows the database's name, type and creator, record count, fields, display\n"
+               "order, sort keys, popup lists, access levels, author and comments.\n");
   }
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+
+  int Run(Context& ctx, const Arguments& args) override {
     DatabaseHead db;
     if (!OpenHeadForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     if (ctx.json) {

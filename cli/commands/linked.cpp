@@ -1,7 +1,7 @@
 // linked FILE RECORD FIELD: the records a Link field of a record leads to.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -16,21 +16,22 @@ class LinkedCommand : public Command {
  public:
   std::string name() const override { return "linked"; }
   std::string summary() const override { return "list the records a Link field leads to"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] [--password PW] linked FILE RECORD FIELD [--all]\n"
-           "Opens the database that Link field FIELD (a slot number 0-29 or a name) of\n"
-           "record RECORD (its index in table order) names, in FILE's folder, and lists\n"
-           "the records linked to that record exactly as `records` lists records: those\n"
-           "whose \"Other Field #\" holds the record's link value and that pass the\n"
-           "linked database's filters.\n"
-           "  --all    the linked records whatever the filters say\n"
-           "The linked database must pass its \"Open Database\" access check.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json", "--password"})
+        .Positional("FILE")
+        .Positional("RECORD")
+        .Positional("FIELD")
+        .About("Opens the database that Link field FIELD (a slot number 0-29 or a name) of\n"
+               "record RECORD (its index in table order) names, in FILE's folder, and lists\n"
+               "the records linked to that record exactly as `records` lists records: those\n"
+               "whose \"Other Field #\" holds the record's link value and that pass the\n"
+               "linked database's filters.\n")
+        .Flag("--all", "the linked records whatever the filters say")
+        .Notes("The linked database must pass its \"Open Database\" access check.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {"--all"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 3) return UsageError(ctx, *this, "expected FILE RECORD FIELD");
+
+  int Run(Context& ctx, const Arguments& args) override {
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     auto record = ParseNumber(args.positional()[1]);

@@ -2,7 +2,6 @@
 #include <algorithm>
 #include <ostream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/json.h"
 #include "engine/database_folder.h"
@@ -29,23 +28,22 @@ class ListCommand : public Command {
  public:
   std::string name() const override { return "list"; }
   std::string summary() const override { return "list the databases in the data folder"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] list [FOLDER]\n"
-           "Lists the .PDB files of the data folder (or of FOLDER): each database's\n"
-           "name, file, number of records and whether a password protects it. A file\n"
-           "that cannot be read as a database is listed with the reason. The data\n"
-           "folder is ~/Documents/Cardovex, or the folder named by CARDOVEX_DATA_DIR;\n"
-           "any command's FILE without a folder is also looked for there, with or\n"
-           "without \".PDB\", when it is not a file where the command runs.\n"
-           "With --json: {\"folder\": ..., \"databases\": [{\"name\", \"file\",\n"
-           "\"records\", \"protected\"}]} (an unreadable file has \"error\" instead of\n"
-           "\"name\", \"records\" and \"protected\").\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FOLDER", kOptional)
+        .About("Lists the .PDB files of the data folder (or of FOLDER): each database's\n"
+               "name, file, number of records and whether a password protects it. A file\n"
+               "that cannot be read as a database is listed with the reason. The data\n"
+               "folder is ~/Documents/Cardovex, or the folder named by CARDOVEX_DATA_DIR;\n"
+               "any command's FILE without a folder is also looked for there, with or\n"
+               "without \".PDB\", when it is not a file where the command runs.\n"
+               "With --json: {\"folder\": ..., \"databases\": [{\"name\", \"file\",\n"
+               "\"records\", \"protected\"}]} (an unreadable file has \"error\" instead of\n"
+               "\"name\", \"records\" and \"protected\").\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() > 1) return UsageError(ctx, *this, "expected at most FOLDER");
+
+  int Run(Context& ctx, const Arguments& args) override {
     const std::string folder = args.positional().empty() ? DataFolder() : args.positional()[0];
     std::optional<FileState> state = StatFile(folder);
     if (!state) return Failure(ctx, "there is no folder " + folder);

@@ -1,5 +1,4 @@
 // listing FILE: the text listing of one record or of the records in view.
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
@@ -15,28 +14,27 @@ class ListingCommand : public Command {
  public:
   std::string name() const override { return "listing"; }
   std::string summary() const override { return "write records as a \"name: value\" text listing"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] listing FILE [--record N]\n"
-           "                                          [-o OUT [--force]] [--encoding E]\n"
-           "Writes the records in view (or record N, its index in table order) as the\n"
-           "Export Record(s) command does: per record one \"NAME: VALUE\" line for each\n"
-           "used field marked Export/Print, in display order, then 40 dashes. A Link\n"
-           "field lists its linked records in its place, indented by three blanks per\n"
-           "level. Lines end in LF.\n"
-           "  -o OUT   write to OUT instead of standard output ('-'); a FIFO or\n"
-           "           device is written into\n"
-           "  --force  write OUT even when it is a database or FILE itself\n" +
-           std::string(kEncodingHelp);
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .About("Writes the records in view (or record N, its index in table order) as the\n"
+               "Export Record(s) command does: per record one \"NAME: VALUE\" line for each\n"
+               "used field marked Export/Print, in display order, then 40 dashes. A Link\n"
+               "field lists its linked records in its place, indented by three blanks per\n"
+               "level. Lines end in LF.\n")
+        .Option("--record", "N", "record N alone")
+        .Option("-o", "OUT",
+                "write to OUT instead of standard output ('-'); a FIFO or device is written into")
+        .Flag("--force", "write OUT even when it is a database or FILE itself");
+    DeclareEncoding(syntax);
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {"--record", "-o", "--encoding"}, {"--force"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
     TextEncoding encoding;
     if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
     const std::string target = args.value("-o").value_or("-");
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     if (target != "-" && !TextTargetAllowed(ctx, args, target, args.positional()[0])) {
       return kExitFailed;
     }

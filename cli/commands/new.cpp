@@ -1,7 +1,7 @@
 // new FILE: a new database with the fields given.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/field_spec.h"
@@ -16,25 +16,23 @@ class NewCommand : public Command {
  public:
   std::string name() const override { return "new"; }
   std::string summary() const override { return "create a new database with the fields given"; }
-  std::string help() const override {
-    return std::string(
-               "Usage: cardovex-cli new FILE --name NAME --field DEF [--field DEF ...]\n"
-               "                        [--extension] [--force]\n"
-               "Creates a database whose fields take slots 0, 1, ... in the order given.\n"
-               "  --name NAME    the database name (at most 19 characters)\n"
-               "  --field DEF   NAME:TYPE[:option=value,...]; TYPE is a type label: Text,\n"
-               "                 Integer, Float, Pop-Up, Check-Box, Unique, Image, Date, Time,\n"
-               "                 Link, Linked, Note, Heading, DB Popup, Calculated\n"
-               "  --extension    records carry the 20-byte prefix extension\n"
-               "  --force        replace FILE if it exists\n") +
-           kFieldSpecHelp;
+  void Declare(Syntax& syntax) const override {
+    syntax.Positional("FILE")
+        .About("Creates a database whose fields take slots 0, 1, ... in the order given.\n")
+        .Option("--name", "NAME", "the database name (at most 19 characters)", Take::kRequired)
+        .Option("--field", "DEF",
+                "NAME:TYPE[:option=value,...]; TYPE is a type label: Text, Integer, Float, "
+                "Pop-Up, Check-Box, Unique, Image, Date, Time, Link, Linked, Note, Heading, "
+                "DB Popup, Calculated",
+                Take::kRepeatable)
+        .Flag("--extension", "records carry the 20-byte prefix extension")
+        .Flag("--force", "replace FILE if it exists")
+        .Notes(kFieldSpecHelp);
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {"--name", "--field"}, {"--extension", "--force"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     const std::string path = args.positional()[0];
     std::string name, error;
     if (!ToStoredText(args.value("--name").value_or(""), "--name", name, error)) {

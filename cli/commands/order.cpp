@@ -3,7 +3,6 @@
 #include <ostream>
 #include <sstream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -18,23 +17,24 @@ class OrderCommand : public Command {
  public:
   std::string name() const override { return "order"; }
   std::string summary() const override { return "show or change the display order of the fields"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] order FILE [up FIELD | down FIELD ...]\n"
-           "       cardovex-cli order FILE --set FIELD,FIELD,...\n"
-           "Without changes, shows the 30 positions: position, slot and field name (with\n"
-           "--json an array of {\"position\", \"slot\", \"name\"}).\n"
-           "  up FIELD, down FIELD  swap the field with its neighbour above or below, in\n"
-           "                        the order given; the first position cannot move up\n"
-           "                        nor the last (29) down\n"
-           "  --set LIST            the whole order: all 30 slots (numbers or names),\n"
-           "                        comma-separated, each once\n"
-           "FIELD is a slot number (0-29) or a field name. Changes need the \"DB\n"
-           "Properties\" access.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .Positional("MOVE", kAnyNumber)
+        .Form({"FILE", "[up FIELD | down FIELD ...]"})
+        .Form({"FILE", "(--set)"})
+        .About("Without changes, shows the 30 positions: position, slot and field name (with\n"
+               "--json an array of {\"position\", \"slot\", \"name\"}). Each \"up FIELD\" or\n"
+               "\"down FIELD\" swaps the field with its neighbour above or below, in the order\n"
+               "given; the first position cannot move up nor the last (29) down.\n")
+        .Option("--set", "LIST",
+                "the whole order: all 30 slots (numbers or names), comma-separated, each once")
+        .Notes("FIELD is a slot number (0-29) or a field name. Changes need the \"DB\n"
+               "Properties\" access.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--set"}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
     if (p.empty() || p.size() % 2 == 0) return UsageError(ctx, *this, "expected FILE [up|down FIELD ...]");
     if (p.size() > 1 && args.has("--set")) return UsageError(ctx, *this, "--set replaces the moves");

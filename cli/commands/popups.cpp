@@ -1,7 +1,7 @@
 // popups FILE FIELD [list|add|rename|delete|sort]: the popup list editor.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -16,27 +16,29 @@ class PopupsCommand : public Command {
  public:
   std::string name() const override { return "popups"; }
   std::string summary() const override { return "list or edit a field's popup list"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] popups FILE FIELD [list]\n"
-           "       cardovex-cli popups FILE FIELD add VALUE [VALUE ...]\n"
-           "       cardovex-cli popups FILE FIELD rename ENTRY NEW-VALUE\n"
-           "       cardovex-cli popups FILE FIELD delete ENTRY\n"
-           "       cardovex-cli popups FILE FIELD sort on|off\n"
-           "FIELD is a slot number (0-29) or a field name. ENTRY is an entry's text or\n"
-           "#N, its number from 0 in entry order (the number a Pop-Up record stores).\n"
-           "list shows the entries as the list shows them (sorted when \"Sort Popups\"\n"
-           "is on), each with its entry number; with --json an array of {\"entry\",\n"
-           "\"text\"}. A list holds at most 60 entries of at most 79 characters.\n"
-           "Deleting an entry of a Pop-Up field renumbers every record: records that\n"
-           "held it get \"No Value\", later entries move down by one.\n"
-           "Changes need the \"DB Properties\" and \"Edit Popups\" access.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .Positional("FIELD")
+        .Positional("ACTION", kAnyNumber)
+        .Form({"FILE", "FIELD", "[list]"})
+        .Form({"FILE", "FIELD", "add", "VALUE [VALUE ...]"})
+        .Form({"FILE", "FIELD", "rename", "ENTRY", "NEW-VALUE"})
+        .Form({"FILE", "FIELD", "delete", "ENTRY"})
+        .Form({"FILE", "FIELD", "sort", "on|off"})
+        .About("FIELD is a slot number (0-29) or a field name. ENTRY is an entry's text or\n"
+               "#N, its number from 0 in entry order (the number a Pop-Up record stores).\n"
+               "list shows the entries as the list shows them (sorted when \"Sort Popups\"\n"
+               "is on), each with its entry number; with --json an array of {\"entry\",\n"
+               "\"text\"}. A list holds at most 60 entries of at most 79 characters.\n"
+               "Deleting an entry of a Pop-Up field renumbers every record: records that\n"
+               "held it get \"No Value\", later entries move down by one.\n"
+               "Changes need the \"DB Properties\" and \"Edit Popups\" access.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
-    if (p.size() < 2) return UsageError(ctx, *this, "expected FILE FIELD");
     const std::string action = p.size() > 2 ? p[2] : "list";
     const std::vector<std::string> rest(p.begin() + std::min<size_t>(p.size(), 3), p.end());
 

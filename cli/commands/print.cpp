@@ -1,5 +1,4 @@
 // print FILE: the listing handed to the print command.
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json_output.h"
@@ -16,22 +15,24 @@ class PrintCommand : public Command {
  public:
   std::string name() const override { return "print"; }
   std::string summary() const override { return "print records through the print command"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] print FILE [--record N] [--command CMD]\n"
-           "                                [--arg ARG]...\n"
-           "Writes the listing of the records in view (or of record N) to\n"
-           "cxprnttemp.txt in the documents folder, runs the print command on it\n"
-           "(`lp FILE` unless --command names another program; each --arg goes before\n"
-           "the file) and removes the file again. Exit code 0 of the command reports\n"
-           "\"Data Printed OK\", 63 means cancelled (no message), others report a\n"
-           "problem. Nothing is run when the listing is empty.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .About("Writes the listing of the records in view (or of record N) to\n"
+               "cxprnttemp.txt in the documents folder, runs the print command on it\n"
+               "and removes the file again.\n")
+        .Option("--record", "N", "record N alone (its index in table order)")
+        .Option("--command", "CMD", "the print command (default: lp FILE)")
+        .Option("--arg", "ARG", "an argument for the print command, before the file",
+                Take::kRepeatable)
+        .Notes("Exit code 0 of the command reports \"Data Printed OK\", 63 means cancelled\n"
+               "(no message), others report a problem. Nothing is run when the listing is\n"
+               "empty.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {"--record", "--command", "--arg"}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     std::optional<size_t> record;

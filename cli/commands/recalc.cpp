@@ -1,7 +1,6 @@
 // recalc FILE: recompute every calculated field and save.
 #include <ostream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json_output.h"
@@ -14,20 +13,18 @@ class RecalcCommand : public Command {
  public:
   std::string name() const override { return "recalc"; }
   std::string summary() const override { return "recompute the calculated fields and save"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli recalc FILE\n"
-           "Runs one full recalculation pass from record 0, in table order, over the\n"
-           "records in view (every record when both filters are off), then saves FILE.\n"
-           "When a sort key is a Calculated field the records are sorted again\n"
-           "afterwards and the fields that use the previous record are recomputed in\n"
-           "the new order. Results use the decimal separator of the global options.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Positional("FILE").About(
+        "Runs one full recalculation pass from record 0, in table order, over the\n"
+        "records in view (every record when both filters are off), then saves FILE.\n"
+        "When a sort key is a Calculated field the records are sorted again\n"
+        "afterwards and the fields that use the previous record are recomputed in\n"
+        "the new order. Results use the decimal separator of the global options.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
     Database db;
     DataSession session(db, ctx.locale, ctx.ui);
     if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;

@@ -3,7 +3,7 @@
 #include <csignal>
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/json_output.h"
 #include "design/receive_access.h"
@@ -26,28 +26,27 @@ class ReceiveCommand : public Command {
  public:
   std::string name() const override { return "receive"; }
   std::string summary() const override { return "receive beamed databases and records"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--yes] [--password PW] receive [--listen HOST:PORT] [--count N]\n"
-           "Listens for OBEX transfers over TCP (default: the ReceiveAddress setting, else\n"
-           "0.0.0.0:6500, which needs no privileges) and stores what arrives in the data\n"
-           "folder: a database is stored after asking (an existing one is replaced only\n"
-           "when that is answered Yes), records are inserted into the database of the\n"
-           "same name, which must be present. --yes answers every question Yes; without\n"
-           "it the questions are asked on the terminal, or answered No when there is none.\n"
-           "A received database is stored only when it opens whole. Records go through\n"
-           "the \"Open Database\" and \"Add Records\" checks of their database: where one\n"
-           "asks for the password, --password answers it; without it nothing is stored.\n"
-           "Several peers are served at once; one that stops sending or reading is\n"
-           "dropped after a time-out. Ctrl-C (SIGINT) or SIGTERM ends the command.\n"
-           "  --count N   stop after N objects have arrived (default: run until Ctrl-C)\n"
-           "Prints \"Listening on ADDR\" and one line per object.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--yes", "--password"})
+        .About("Listens for OBEX transfers over TCP (default: the ReceiveAddress setting, else\n"
+               "0.0.0.0:6500, which needs no privileges) and stores what arrives in the data\n"
+               "folder: a database is stored after asking (an existing one is replaced only\n"
+               "when that is answered Yes), records are inserted into the database of the\n"
+               "same name, which must be present. --yes answers every question Yes; without\n"
+               "it the questions are asked on the terminal, or answered No when there is none.\n"
+               "A received database is stored only when it opens whole. Records go through\n"
+               "the \"Open Database\" and \"Add Records\" checks of their database: where one\n"
+               "asks for the password, --password answers it; without it nothing is stored.\n"
+               "Several peers are served at once; one that stops sending or reading is\n"
+               "dropped after a time-out. Ctrl-C (SIGINT) or SIGTERM ends the command.\n")
+        .Option("--listen", "HOST:PORT", "the address to listen on")
+        .Option("--count", "N", "stop after N objects have arrived (default: run until Ctrl-C)")
+        .Notes("Prints \"Listening on ADDR\" and one line per object.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {"--listen", "--count"}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (!args.positional().empty()) return UsageError(ctx, *this, "unexpected argument");
     obex::ReceiverOptions options;
     auto settings = OpenDesktopSettings();
     if (auto a = settings->Get(obex::kReceiveAddressSetting); a && !a->empty()) options.address = *a;

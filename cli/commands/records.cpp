@@ -2,7 +2,6 @@
 // of all records, one record, or the result of a query), in table order.
 #include <ostream>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/query.h"
@@ -16,34 +15,36 @@ class RecordsCommand : public Command {
  public:
   std::string name() const override { return "records"; }
   std::string summary() const override { return "list the records with every value as shown"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--json] records FILE [--all | --record INDEX]\n"
-           "       cardovex-cli [--json] records FILE [--where COND]... [--sort KEY]...\n"
-           "Lists the records in view (those that pass the database's filters) in\n"
-           "table order, each field in display order, values as the list shows them\n"
-           "with the date, time and decimal conventions of the global options.\n"
-           "  --all            every record, whatever the filters say\n"
-           "  --record INDEX   the one record INDEX\n"
-           "  --where COND     only the records that meet COND, written as 'filter'\n"
-           "                   takes it (FIELD=VALUE); every COND given must hold, and\n"
-           "                   the database's own filters play no part\n"
-           "  --sort KEY       up to three keys, written as 'sort' takes them, the\n"
-           "                   first given first; records equal on every key stay in\n"
-           "                   table order\n"
-           "A query changes nothing: FILE is not written, so it also works on a file\n"
-           "that may only be read. The index printed is always the record's place in\n"
-           "FILE, the INDEX that 'edit' and 'delete --record' take.\n"
-           "With --json: an array of {\"index\": N, \"fields\": [{\"slot\", \"name\",\n"
-           "\"text\", \"value\"}]}, line breaks kept; \"value\" is typed and the same\n"
-           "under any conventions (numbers, true/false, \"YYYY-MM-DD\", \"HH:MM:SS\",\n"
-           "null for no value). Without: a tab-separated table with a header row,\n"
-           "the index first, line breaks shown as blanks.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FILE")
+        .Form({"FILE", "--all|--record"})
+        .Form({"FILE", "--where", "--sort"})
+        .About("Lists the records in view (those that pass the database's filters) in\n"
+               "table order, each field in display order, values as the list shows them\n"
+               "with the date, time and decimal conventions of the global options.\n")
+        .Flag("--all", "every record, whatever the filters say")
+        .Option("--record", "INDEX", "the one record INDEX")
+        .Option("--where", "COND",
+                "only the records that meet COND, written as 'filter' takes it (FIELD=VALUE); "
+                "every COND given must hold, and the database's own filters play no part",
+                Take::kRepeatable)
+        .Option("--sort", "KEY",
+                "up to three keys, written as 'sort' takes them, the first given first; records "
+                "equal on every key stay in table order",
+                Take::kRepeatable)
+        .Notes("A query changes nothing: FILE is not written, so it also works on a file\n"
+               "that may only be read. The index printed is always the record's place in\n"
+               "FILE, the INDEX that 'edit' and 'delete --record' take.\n"
+               "With --json: an array of {\"index\": N, \"fields\": [{\"slot\", \"name\",\n"
+               "\"text\", \"value\"}]}, line breaks kept; \"value\" is typed and the same\n"
+               "under any conventions (numbers, true/false, \"YYYY-MM-DD\", \"HH:MM:SS\",\n"
+               "null for no value). Without: a tab-separated table with a header row,\n"
+               "the index first, line breaks shown as blanks.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--record", "--where", "--sort"}, {"--all"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 1) return UsageError(ctx, *this, "expected FILE");
+
+  int Run(Context& ctx, const Arguments& args) override {
     const bool query = args.has("--where") || args.has("--sort");
     if (args.has("--all") + args.has("--record") + query > 1) {
       return UsageError(ctx, *this, "--all, --record and a query go alone");

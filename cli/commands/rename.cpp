@@ -1,7 +1,7 @@
 // rename FILE NAME: the database's name (the file keeps its file name).
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -16,17 +16,17 @@ class RenameCommand : public Command {
  public:
   std::string name() const override { return "rename"; }
   std::string summary() const override { return "change the database's name (not the file's)"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] rename FILE NAME\n"
-           "Sets the name stored in the database (at most 19 characters); the file\n"
-           "keeps its file name. Needs the \"DB Properties\" access.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .Positional("NAME")
+        .About("Sets the name stored in the database (at most 19 characters); the file\n"
+               "keeps its file name. Needs the \"DB Properties\" access.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
+
+  int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE NAME");
     std::string name, error;
     if (!ToStoredText(args.positional()[1], "NAME", name, error)) return UsageError(ctx, *this, error);
     if (name.size() > kDatabaseNameChars) {

@@ -3,7 +3,6 @@
 #include <string>
 #include <vector>
 
-#include "cli/args.h"
 #include "cli/command.h"
 #include "cli/commands/text_output.h"
 #include "cli/database_access.h"
@@ -20,29 +19,29 @@ class ReportCommand : public Command {
  public:
   std::string name() const override { return "report"; }
   std::string summary() const override { return "count, extremes, sum and average of a field"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli report FILE FIELD [-o OUT [--force]] [--encoding E]\n"
-           "Prints the report of FIELD (a slot number 0-29 or a name) over the records\n"
-           "in view, exactly as the Report Results dialog shows it: lines ending in\n"
-           "CR LF, tabs as they are. Integer, Float, Check-Box, Time, Date and\n"
-           "Calculated fields have reports.\n"
-           "  -o OUT   write the report to OUT instead (followed by one LF), as the\n"
-           "           dialog's Export does; a FIFO or device is written into; '-'\n"
-           "           is standard output\n"
-           "  --force  write OUT even when it is a database or FILE itself\n" +
-           std::string(kEncodingHelp);
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--json"})
+        .Positional("FILE")
+        .Positional("FIELD")
+        .About("Prints the report of FIELD (a slot number 0-29 or a name) over the records\n"
+               "in view, exactly as the Report Results dialog shows it: lines ending in\n"
+               "CR LF, tabs as they are. Integer, Float, Check-Box, Time, Date and\n"
+               "Calculated fields have reports.\n")
+        .Option("-o", "OUT",
+                "write the report to OUT instead (followed by one LF), as the dialog's Export "
+                "does; a FIFO or device is written into; '-' is standard output")
+        .Flag("--force", "write OUT even when it is a database or FILE itself");
+    DeclareEncoding(syntax);
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"-o", "--encoding"}, {"--force"});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     TextEncoding encoding;
     if (int code; !EncodingOption(ctx, *this, args, encoding, code)) return code;
     const std::string target = args.value("-o").value_or("-");
     if (target != "-") {
       if (int code = RefuseJson(ctx, *this)) return code;
     }
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE FIELD");
     if (target != "-" && !TextTargetAllowed(ctx, args, target, args.positional()[0])) {
       return kExitFailed;
     }

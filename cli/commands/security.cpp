@@ -2,7 +2,7 @@
 // Access settings.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -17,24 +17,26 @@ class SecurityCommand : public Command {
  public:
   std::string name() const override { return "security"; }
   std::string summary() const override { return "show or set the access levels and the password"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--password PW] security FILE [OPERATION LEVEL ...]\n"
-           "                    [--set-password TEXT]\n"
-           "Without changes, shows the level of each guarded operation (with --json as\n"
-           "an object). OPERATION is one of \"Open Database\", \"Add Records\", \"Edit\n"
-           "Records\", \"Delete Records\", \"DB Properties\", \"Edit Popups\", \"Beam Data\"\n"
-           "(case, blanks and hyphens ignored: edit-records). LEVEL is \"Full Access\",\n"
-           "\"Password Required\", \"No Access\" or, for Edit Records only, \"View Records\n"
-           "Only\" (also full, password, none, view-only).\n"
-           "  --set-password TEXT  the database password (at most 19 characters; \"\"\n"
-           "                       for none); compared exactly, case included\n"
-           "Changes need the \"DB Properties\" access (the current password when it is\n"
-           "\"Password Required\", given with --password).\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .Positional("OPERATION LEVEL", kAnyNumber)
+        .Form({"FILE", "[OPERATION LEVEL ...]", "--set-password"})
+        .About("Without changes, shows the level of each guarded operation (with --json as\n"
+               "an object). OPERATION is one of \"Open Database\", \"Add Records\", \"Edit\n"
+               "Records\", \"Delete Records\", \"DB Properties\", \"Edit Popups\", \"Beam Data\"\n"
+               "(case, blanks and hyphens ignored: edit-records). LEVEL is \"Full Access\",\n"
+               "\"Password Required\", \"No Access\" or, for Edit Records only, \"View Records\n"
+               "Only\" (also full, password, none, view-only).\n")
+        .Option("--set-password", "TEXT",
+                "the database password (at most 19 characters; \"\" for none); compared exactly, "
+                "case included")
+        .Notes("Changes need the \"DB Properties\" access (the current password when it is\n"
+               "\"Password Required\", given with --password).\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--set-password"}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
     if (p.empty() || p.size() % 2 == 0) return UsageError(ctx, *this, "expected FILE [OPERATION LEVEL ...]");
     if (p.size() == 1 && !args.has("--set-password")) {

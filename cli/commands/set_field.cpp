@@ -3,7 +3,7 @@
 #include <ostream>
 #include <set>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -39,47 +39,49 @@ class SetFieldCommand : public Command {
   std::string summary() const override {
     return "show or change a field's settings (type changes convert the records)";
   }
-  std::string help() const override {
-    return "Usage: cardovex-cli [--yes|--no] [--password PW] set-field FILE FIELD [settings]\n"
-           "FIELD is a slot number (0-29) or a field name. Without settings the field's\n"
-           "settings are shown (with --json as an object). Settings:\n"
-           "  --name TEXT             field name (at most 19 characters)\n"
-           "  --type TYPE             Not-Used, Text, Integer, Float, Pop-Up, Check-Box,\n"
-           "                          Unique, Image, Date, Time, Link, Linked, Note, Heading,\n"
-           "                          DB Popup, Calculated\n"
-           "  --max-chars N           Max Characters (stored at most 254)\n"
-           "  --places N              Float: places after the decimal point, 0-4\n"
-           "  --pixels N              Pixels Shown (stored x 2/3, at most 160)\n"
-           "  --visible yes|no        --export yes|no        --popups-append yes|no\n"
-           "  --default VALUE         Pop-Up default: an entry's text or \"No Value\"\n"
-           "  --behavior B            Date/Time Behavior: its label or index\n"
-           "  --other-db NAME         Link, Linked, DB Popup: the other database's name\n"
-           "  --other-db-from FILE    the same, read from that database file's header\n"
-           "  --other-field N         Other Field # (counted from 1)\n"
-           "  --group N               DB Popup: Group (0=none)\n"
-           "  --show-value-from F     Link: a field of the other database, or none\n"
-           "  --value1 F, --value2 F  Calculated operands: a field, or none for a constant\n"
-           "  --constant1 C, --constant2 C   the constants (at most 8 characters)\n"
-           "  --prev1 yes|no, --prev2 yes|no take the operand from the previous record\n"
-           "  --operation OP          + - * / Min Max Average\n"
-           "  --result-format FMT     \"To 4 Decimal Places\", Integer, Time, Date, \"To 3\n"
-           "                          Decimal Places\", \"To 2 ...\", \"To 1 Decimal Place\" or 0-6\n"
-           "A type change of a field that holds data may ask \"Can't Switch these Field\n"
-           "Types without data loss.  Continue?\" or whether to use the existing data for\n"
-           "unique, link or linked values: answer with --yes or --no; without them the\n"
-           "command refuses and the file is not touched. A No to the data-loss question\n"
-           "leaves the file byte for byte as it was. Needs the \"DB Properties\" access.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Globals({"--yes|--no", "--password"})
+        .Positional("FILE")
+        .Positional("FIELD")
+        .Form({"FILE", "FIELD", "[settings]"})
+        .About("FIELD is a slot number (0-29) or a field name. Without settings the field's\n"
+               "settings are shown (with --json as an object). Settings:\n")
+        .Option("--name", "TEXT", "field name (at most 19 characters)")
+        .Option("--type", "TYPE",
+                "Not-Used, Text, Integer, Float, Pop-Up, Check-Box, Unique, Image, Date, Time, "
+                "Link, Linked, Note, Heading, DB Popup, Calculated")
+        .Option("--max-chars", "N", "Max Characters (stored at most 254)")
+        .Option("--places", "N", "Float: places after the decimal point, 0-4")
+        .Option("--pixels", "N", "Pixels Shown (stored x 2/3, at most 160)")
+        .Option("--visible", "yes|no", "shown in the list")
+        .Option("--export", "yes|no", "Export/Print")
+        .Option("--popups-append", "yes|no", "Pop-Up: Popups Append")
+        .Option("--default", "VALUE", "Pop-Up default: an entry's text or \"No Value\"")
+        .Option("--behavior", "B", "Date/Time Behavior: its label or index")
+        .Option("--other-db", "NAME", "Link, Linked, DB Popup: the other database's name")
+        .Option("--other-db-from", "FILE", "the same, read from that database file's header")
+        .Option("--other-field", "N", "Other Field # (counted from 1)")
+        .Option("--group", "N", "DB Popup: Group (0=none)")
+        .Option("--show-value-from", "F", "Link: a field of the other database, or none")
+        .Option("--value1", "F", "Calculated operand 1: a field, or none for a constant")
+        .Option("--value2", "F", "Calculated operand 2: a field, or none for a constant")
+        .Option("--constant1", "C", "the constant of operand 1 (at most 8 characters)")
+        .Option("--constant2", "C", "the constant of operand 2 (at most 8 characters)")
+        .Option("--prev1", "yes|no", "take operand 1 from the previous record")
+        .Option("--prev2", "yes|no", "take operand 2 from the previous record")
+        .Option("--operation", "OP", "+ - * / Min Max Average")
+        .Option("--result-format", "FMT",
+                "\"To 4 Decimal Places\", Integer, Time, Date, \"To 3 Decimal Places\", \"To 2 "
+                "...\", \"To 1 Decimal Place\" or 0-6")
+        .Notes("A type change of a field that holds data may ask \"Can't Switch these Field\n"
+               "Types without data loss.  Continue?\" or whether to use the existing data for\n"
+               "unique, link or linked values: answer with --yes or --no; without them the\n"
+               "command refuses and the file is not touched. A No to the data-loss question\n"
+               "leaves the file byte for byte as it was. Needs the \"DB Properties\" access.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv,
-              {"--name", "--type", "--max-chars", "--places", "--pixels", "--visible", "--export",
-               "--popups-append", "--default", "--behavior", "--other-db", "--other-field",
-               "--other-db-from", "--group", "--show-value-from", "--value1", "--value2", "--constant1",
-               "--constant2", "--prev1", "--prev2", "--operation", "--result-format"},
-              {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE FIELD");
+
+  int Run(Context& ctx, const Arguments& args) override {
     Database db;
     if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
     const int slot = ResolveField(db, args.positional()[1]);
@@ -137,7 +139,7 @@ class SetFieldCommand : public Command {
 
   // Reads the options into the settings, as the dialog's controls would
   // hold them; false with `error` for a value that names nothing.
-  static bool Collect(const Args& args, const Database& db, int slot, FieldSettings& s, bool& any,
+  static bool Collect(const Arguments& args, const Database& db, int slot, FieldSettings& s, bool& any,
                       std::string& error) {
     auto number = [&](const char* option, int& into) {
       auto v = args.value(option);

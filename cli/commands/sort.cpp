@@ -1,7 +1,7 @@
 // sort FILE KEY [KEY [KEY]]: the Sorting dialog's OK from the command line.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json_output.h"
@@ -15,26 +15,25 @@ class SortCommand : public Command {
  public:
   std::string name() const override { return "sort"; }
   std::string summary() const override { return "set up to three sort keys, sort and save"; }
-  std::string help() const override {
-    return "Usage: cardovex-cli sort FILE KEY [KEY [KEY]]\n"
-           "Sets the primary, secondary and tertiary sort keys as the Sorting dialog\n"
-           "does, sorts the records, recalculates what depends on their order and\n"
-           "saves FILE. KEY is a slot number (0-29) or a field name (case ignored),\n"
-           "optionally followed by \":reverse\" (or \":forward\", the default); keys not\n"
-           "given are set to \"No Field\". A KEY that names no field is a usage error.\n"
-           "Each key is checked as the dialog checks it: a Not-Used, Image, Link or\n"
-           "Heading field, and a Calculated field whose value depends on the previous\n"
-           "record, cannot be a sort key; the dialog's message goes to stderr, FILE\n"
-           "is left as it was and the exit status is 1. As in the dialog, the tertiary\n"
-           "key always takes the primary key's direction.\n"
-           "Records that compare equal on every key may come out in any order.\n";
+  void Declare(Syntax& syntax) const override {
+    syntax.Positional("FILE")
+        .Positional("KEY", Count{1, 3})
+        .About("Sets the primary, secondary and tertiary sort keys as the Sorting dialog\n"
+               "does, sorts the records, recalculates what depends on their order and\n"
+               "saves FILE. KEY is a slot number (0-29) or a field name (case ignored),\n"
+               "optionally followed by \":reverse\" (or \":forward\", the default); keys not\n"
+               "given are set to \"No Field\". A KEY that names no field is a usage error.\n"
+               "Each key is checked as the dialog checks it: a Not-Used, Image, Link or\n"
+               "Heading field, and a Calculated field whose value depends on the previous\n"
+               "record, cannot be a sort key; the dialog's message goes to stderr, FILE\n"
+               "is left as it was and the exit status is 1. As in the dialog, the tertiary\n"
+               "key always takes the primary key's direction.\n"
+               "Records that compare equal on every key may come out in any order.\n");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
+
+  int Run(Context& ctx, const Arguments& args) override {
     const auto& p = args.positional();
-    if (p.size() < 2 || p.size() > 4) return UsageError(ctx, *this, "expected FILE and one to three KEYs");
     Database db;
     DataSession session(db, ctx.locale, ctx.ui);
     if (!OpenForCommand(ctx, p[0], session)) return kExitFailed;

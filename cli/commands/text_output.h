@@ -5,7 +5,7 @@
 #include <ostream>
 #include <string_view>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "ops/text_sink.h"
 #include "platform/text_codec.h"
@@ -14,7 +14,7 @@ namespace cx::cli {
 
 // False (after the message) when `out` is a database or the input file
 // `in` and --force was not given.
-inline bool TextTargetAllowed(Context& ctx, const Args& args, const std::string& out,
+inline bool TextTargetAllowed(Context& ctx, const Arguments& args, const std::string& out,
                               const std::string& in) {
   if (args.has("--force")) return true;
   Status s = CheckTextTarget(out, {in});

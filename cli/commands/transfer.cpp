@@ -2,7 +2,7 @@
 // database of the same design.
 #include <ostream>
 
-#include "cli/args.h"
+#include "cli/argument_text.h"
 #include "cli/command.h"
 #include "cli/commands/design_common.h"
 #include "cli/database_access.h"
@@ -21,27 +21,29 @@ class TransferCommand : public Command {
     return move_ ? "move records to another database with the same field types"
                  : "copy records to another database with the same field types";
   }
-  std::string help() const override {
+  void Declare(Syntax& syntax) const override {
     const std::string verb = move_ ? "Moves" : "Copies";
-    return "Usage: cardovex-cli [--password PW] " + name() + " FILE TARGET [--record N]\n" + verb +
-           " the records in view (those that pass FILE's filters), or record N\n"
-           "(its index in table order, as `records` shows it), to the database TARGET,\n"
-           "whose 30 field types must equal FILE's slot by slot. The records are added at\n"
-           "the end of TARGET, which sorts and recalculates them when it is next opened.\n" +
-           (move_ ? "Moving to FILE itself is refused; each record moved leaves FILE only\n"
-                    "after passing FILE's \"Delete Records\" access check.\n"
-                  : "Copying to FILE itself duplicates the records.\n") +
-           "TARGET must pass its \"Open Database\" and \"Add Records\" access checks\n"
-           "(one --password serves every prompt).\n" +
-           (move_ ? "Nothing leaves FILE unless TARGET was saved first; when TARGET cannot be\n"
-                    "saved the command fails and both files stay as they were.\n"
-                  : "");
+    syntax.Globals({"--password"})
+        .Positional("FILE")
+        .Positional("TARGET")
+        .About(verb +
+               " the records in view (those that pass FILE's filters), or record N\n"
+               "(its index in table order, as `records` shows it), to the database TARGET,\n"
+               "whose 30 field types must equal FILE's slot by slot. The records are added at\n"
+               "the end of TARGET, which sorts and recalculates them when it is next opened.\n" +
+               (move_ ? "Moving to FILE itself is refused; each record moved leaves FILE only\n"
+                        "after passing FILE's \"Delete Records\" access check.\n"
+                      : "Copying to FILE itself duplicates the records.\n") +
+               "TARGET must pass its \"Open Database\" and \"Add Records\" access checks\n"
+               "(one --password serves every prompt).\n" +
+               (move_ ? "Nothing leaves FILE unless TARGET was saved first; when TARGET cannot be\n"
+                        "saved the command fails and both files stay as they were.\n"
+                      : ""))
+        .Option("--record", "N", "record N alone");
   }
 
-  int Run(Context& ctx, const std::vector<std::string>& argv) override {
-    Args args(argv, {"--record"}, {});
-    if (!args.ok()) return UsageError(ctx, *this, args.error());
-    if (args.positional().size() != 2) return UsageError(ctx, *this, "expected FILE TARGET");
+
+  int Run(Context& ctx, const Arguments& args) override {
     const std::string target = LocateDatabase(args.positional()[1]);
     if (!LockDatabases(ctx, {LocateDatabase(args.positional()[0]), target})) return kExitFailed;
     Database db;

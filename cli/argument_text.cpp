@@ -1,4 +1,4 @@
-#include "cli/args.h"
+#include "cli/argument_text.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -7,55 +7,6 @@
 #include "platform/text_codec.h"
 
 namespace cx::cli {
-
-Args::Args(const std::vector<std::string>& args, const std::set<std::string>& withValue,
-           const std::set<std::string>& flags) {
-  bool optionsDone = false;
-  for (size_t i = 0; i < args.size(); ++i) {
-    const std::string& a = args[i];
-    if (optionsDone || a.size() < 2 || a[0] != '-' || a == "-") {
-      positional_.push_back(a);
-      continue;
-    }
-    if (a == "--") {
-      optionsDone = true;
-      continue;
-    }
-    std::string name = a;
-    std::optional<std::string> inlineValue;
-    if (size_t eq = a.find('='); eq != std::string::npos && a.rfind("--", 0) == 0) {
-      name = a.substr(0, eq);
-      inlineValue = a.substr(eq + 1);
-    }
-    if (withValue.count(name)) {
-      if (inlineValue) {
-        values_[name].push_back(*inlineValue);
-      } else if (i + 1 < args.size()) {
-        values_[name].push_back(args[++i]);
-      } else {
-        error_ = "option " + name + " needs a value";
-        return;
-      }
-    } else if (flags.count(name) && !inlineValue) {
-      values_[name].push_back("");
-    } else {
-      error_ = "unknown option " + a;
-      return;
-    }
-  }
-}
-
-std::optional<std::string> Args::value(const std::string& name) const {
-  auto it = values_.find(name);
-  if (it == values_.end() || it->second.empty()) return std::nullopt;
-  return it->second.back();
-}
-
-const std::vector<std::string>& Args::values(const std::string& name) const {
-  static const std::vector<std::string> kNone;
-  auto it = values_.find(name);
-  return it == values_.end() ? kNone : it->second;
-}
 
 bool ToStoredText(const std::string& utf8, const std::string& what, std::string& out,
                   std::string& error) {

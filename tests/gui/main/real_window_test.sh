@@ -32,6 +32,15 @@ cat > "$work/inner.sh" <<'INNER'
 #!/usr/bin/env bash
 set -u
 program=$1 file=$2 work=$3 how=$4
+# xvfb-run goes on when its server fails to start; tell that apart from a
+# program that does not show its window. (The server runs with -noreset:
+# otherwise it resets when this probe disconnects, and a loaded machine
+# refuses the program's connection during the reset.)
+for _ in $(seq 1 50); do
+  xdotool getdisplaygeometry >/dev/null 2>&1 && break
+  sleep 0.1
+done
+xdotool getdisplaygeometry >/dev/null 2>&1 || exit 3
 QT_QPA_PLATFORM=xcb "$program" "$file" >"$work/program.log" 2>&1 &
 pid=$!
 window=""
@@ -83,8 +92,15 @@ chmod +x "$work/inner.sh"
 conf=$XDG_CONFIG_HOME/Cardovex/Cardovex.conf
 for how in quit term; do
   rm -f "$conf"
-  timeout 120 xvfb-run -a -s "-screen 0 1024x768x24 -nolisten tcp" "$work/inner.sh" "$program" "$work/Contacts.PDB" "$work" "$how"
-  code=$?
+  for _ in 1 2 3; do
+    # A display number of its own each time: the server of the run before
+    # may still be ending on the number xvfb-run would otherwise pick again.
+    timeout 120 xvfb-run -a -n $((200 + RANDOM % 700)) -s "-screen 0 1024x768x24 -nolisten tcp -noreset" "$work/inner.sh" "$program" "$work/Contacts.PDB" "$work" "$how"
+    code=$?
+    [ "$code" -eq 3 ] || break
+    echo "the X server did not start; trying again"
+    sleep 1
+  done
   [ "$code" -eq 0 ] || exit 1
   if ! grep -q "LastFileUsed=.*Contacts.PDB" "$conf" 2>/dev/null || ! grep -q "AutoSave=1" "$conf"; then
     echo "FAIL: the settings were not written at the end ($how):"

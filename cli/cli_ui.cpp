@@ -51,7 +51,7 @@ std::optional<std::string> ReadHidden() {
 }
 
 std::string Clean(const std::string& text) {
-  std::string s = Cp1252ToUtf8(text);
+  std::string s = MessageToUtf8(text);
   while (!s.empty() && s.back() == '\n') s.pop_back();
   return s;
 }

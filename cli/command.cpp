@@ -43,7 +43,7 @@ int UsageError(Context& ctx, const Command& command, const std::string& message)
 }
 
 int Failure(Context& ctx, const std::string& message) {
-  std::string text = Cp1252ToUtf8(message);
+  std::string text = MessageToUtf8(message);
   while (!text.empty() && text.back() == '\n') text.pop_back();
   ctx.err << "cardovex-cli: " << (ctx.command.empty() ? "" : ctx.command + ": ") << text << "\n";
   return kExitFailed;

@@ -54,6 +54,25 @@ std::string Cp1252ToUtf8(std::string_view bytes) {
   return out;
 }
 
+std::string MessageToUtf8(std::string_view bytes) {
+  std::string out;
+  out.reserve(bytes.size());
+  for (size_t i = 0; i < bytes.size();) {
+    auto b = static_cast<unsigned char>(bytes[i]);
+    if (b >= 0xC2) {
+      size_t next = i;
+      if (char32_t cp = NextCodePoint(bytes, next); cp != 0xFFFD) {
+        out.append(bytes.substr(i, next - i));
+        i = next;
+        continue;
+      }
+    }
+    out += Cp1252ToUtf8(bytes.substr(i, 1));
+    ++i;
+  }
+  return out;
+}
+
 char32_t NextCodePoint(std::string_view s, size_t& i) {
   auto b0 = static_cast<unsigned char>(s[i++]);
   if (b0 < 0x80) return b0;

@@ -124,7 +124,7 @@ bool QtUiPort::UseNativeDialogs() const {
 void QtUiPort::ShowMessage(const std::string& text, const std::string& caption, MessageIcon icon) {
   RunOnGuiThread([&] {
     const QString title = FromDb(caption);
-    QMessageBox box(IconFor(icon, title), title, FromDb(text), QMessageBox::Ok, parent_);
+    QMessageBox box(IconFor(icon, title), title, FromMessage(text), QMessageBox::Ok, parent_);
     box.setObjectName(QStringLiteral("messageBox"));
     box.exec();
   });
@@ -134,7 +134,7 @@ bool QtUiPort::AskYesNo(const std::string& text, const std::string& caption) {
   bool yes = false;
   RunOnGuiThread([&] {
     const QString title = FromDb(caption);
-    QMessageBox box(IconFor(MessageIcon::None, title), title, FromDb(text),
+    QMessageBox box(IconFor(MessageIcon::None, title), title, FromMessage(text),
                     QMessageBox::Yes | QMessageBox::No, parent_);
     box.setObjectName(QStringLiteral("questionBox"));
     box.setDefaultButton(QMessageBox::Yes);
@@ -147,7 +147,7 @@ Answer QtUiPort::AskYesNoCancel(const std::string& text, const std::string& capt
   Answer answer = Answer::Cancel;
   RunOnGuiThread([&] {
     const QString title = FromDb(caption);
-    QMessageBox box(IconFor(MessageIcon::None, title), title, FromDb(text),
+    QMessageBox box(IconFor(MessageIcon::None, title), title, FromMessage(text),
                     QMessageBox::Yes | QMessageBox::No | QMessageBox::Cancel, parent_);
     box.setObjectName(QStringLiteral("questionBox"));
     box.setDefaultButton(QMessageBox::Yes);

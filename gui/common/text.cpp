@@ -9,6 +9,11 @@ QString FromDb(std::string_view bytes) {
   return QString::fromUtf8(utf8.data(), static_cast<qsizetype>(utf8.size()));
 }
 
+QString FromMessage(std::string_view bytes) {
+  const std::string utf8 = MessageToUtf8(bytes);
+  return QString::fromUtf8(utf8.data(), static_cast<qsizetype>(utf8.size()));
+}
+
 std::optional<std::string> ToDb(const QString& text) {
   bool lossless = true;
   std::string bytes = Utf8ToCp1252(text.toStdString(), &lossless);

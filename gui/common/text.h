@@ -12,6 +12,10 @@ namespace cx::gui {
 // Every byte shows as its Windows-1252 character; none is ever lost.
 QString FromDb(std::string_view bytes);
 
+// A message box's text: the system's and the database's Windows-1252 with
+// file names in UTF-8 put in (see MessageToUtf8).
+QString FromMessage(std::string_view bytes);
+
 // The 8-bit text of `text`, or nothing when a character cannot be held in
 // Windows-1252 (the caller refuses the input; nothing is stored as "?").
 std::optional<std::string> ToDb(const QString& text);

@@ -65,6 +65,19 @@ TEST(CliConventions, ErrorsNameTheToolAndTheCommand) {
   EXPECT_EQ(refused.err.rfind("cardovex-cli: sort: ", 0), 0u) << refused.err;
 }
 
+TEST(CliConventions, ErrorsShowFileNamesAsTheyAreSpelled) {
+  testing::TempDir dir;
+  const std::string missing = dir.File("Z\u00FCrich.PDB");
+  Result r = Cli({"info", missing});
+  EXPECT_EQ(r.code, 1);
+  EXPECT_NE(r.err.find(missing), std::string::npos) << r.err;
+  const std::string path = dir.File("Tags.PDB");
+  ASSERT_EQ(Cli({"new", path, "--name", "Tags", "--field", "Tag:Text"}).code, 0);
+  Result out = Cli({"export-csv", path, dir.File("n\u00E4") + "/x.csv"});
+  EXPECT_EQ(out.code, 1);
+  EXPECT_NE(out.err.find("n\u00E4/x.csv"), std::string::npos) << out.err;
+}
+
 TEST(CliConventions, HelpCommandAndVersionSpellings) {
   EXPECT_EQ(Cli({"help", "records"}).out, Cli({"--help", "records"}).out);
   EXPECT_EQ(Cli({"records", "--help"}).out, Cli({"--help", "records"}).out);

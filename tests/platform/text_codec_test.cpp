@@ -56,5 +56,19 @@ TEST(TextCodecTest, CodePageCharactersAndItsGaps) {
   }
 }
 
+TEST(TextCodecTest, MessagesKeepUtf8FileNamesAndCodePageTexts) {
+  // A database name in Windows-1252 and a folder name in UTF-8, in one
+  // message: both must read as the user wrote them.
+  const std::string message = std::string("Z\xFCrich: cannot open /home/m\xC3\xBCller/") +
+                              "\xD0\x94\xD0\xBE\xD0\xBA/a.PDB";
+  EXPECT_EQ(MessageToUtf8(message), "Z\u00FCrich: cannot open /home/m\u00FCller/\u0414\u043E\u043A/a.PDB");
+  // Bytes that only start a UTF-8 sequence, over-long forms and lone
+  // continuation bytes stay code-page characters; nothing is dropped.
+  EXPECT_EQ(MessageToUtf8("\xC3"), "\u00C3");
+  EXPECT_EQ(MessageToUtf8("\xC0\xAF"), "\u00C0\u00AF");
+  EXPECT_EQ(MessageToUtf8("\xE2\x82"), "\u00E2\u201A");
+  EXPECT_EQ(MessageToUtf8("\x80 plain"), "\u20AC plain");
+}
+
 }  // namespace
 }  // namespace cx

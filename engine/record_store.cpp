@@ -168,6 +168,61 @@ std::string FormatMessage(const char* pattern, long number) {
 
 Database::Database() : schema_(InitSchema()) {}
 
+size_t CountMalformed(const std::vector<DataRecord>& records) {
+  // Each slot's length tells where the next one lies, so one record's walk
+  // is a chain of loads that wait for each other. Four records walked side
+  // by side let those waits overlap.
+  constexpr size_t kLanes = 4;
+  struct Walk {
+    const uint8_t* data;
+    size_t size;
+    size_t off;
+    int slot;
+  };
+  size_t malformed = 0;
+  size_t n = 0;
+  for (; n + kLanes <= records.size(); n += kLanes) {
+    Walk walk[kLanes];
+    unsigned active = 0;
+    for (size_t lane = 0; lane < kLanes; ++lane) {
+      const ByteView r = records[n + lane].bytes();
+      if (r.empty()) continue;
+      const size_t off = DataStart(r);
+      if (off > r.size()) {
+        ++malformed;
+        continue;
+      }
+      walk[lane] = {r.data(), r.size(), off, 0};
+      active |= 1u << lane;
+    }
+    while (active) {
+      for (size_t lane = 0; lane < kLanes; ++lane) {
+        const unsigned bit = 1u << lane;
+        if (!(active & bit)) continue;
+        Walk& w = walk[lane];
+        if (w.slot == format::kFieldCount || w.off + 2 > w.size) {
+          active &= ~bit;
+          continue;
+        }
+        const uint16_t len = GetLE16(w.data + w.off);
+        if (len == format::kEndMark) {
+          active &= ~bit;
+        } else if (w.off + 2 + len > w.size) {
+          ++malformed;
+          active &= ~bit;
+        } else {
+          w.off += 2 + size_t{len};
+          ++w.slot;
+        }
+      }
+    }
+  }
+  for (; n < records.size(); ++n) {
+    if (!RecordIsWellFormed(records[n].bytes())) ++malformed;
+  }
+  return malformed;
+}
+
 Database Database::CreateNew(const std::string& path, const std::string& name) {
   Database db;
   db.path_ = path;
@@ -176,9 +231,9 @@ Database Database::CreateNew(const std::string& path, const std::string& name) {
   return db;
 }
 
-Status Database::Open(const std::string& path, UiPort& ui) {
+Status Database::Open(const std::string& path, UiPort& ui, FileBuffer::Access access) {
   auto image = std::make_shared<FileBuffer>();
-  if (!image->Read(path)) {
+  if (!image->Read(path, access)) {
     const std::string message = FormatMessage(messages::kCannotOpen, path);
     ui.SetBusy(false);
     ui.ShowMessage(message, "Error", MessageIcon::Error);
@@ -231,9 +286,9 @@ Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) 
       db.partial_ = true;
       break;
     }
-    if (!RecordIsWellFormed(bytes)) ++db.malformed_;
     db.records_.emplace_back(bytes, attributes, uniqueID);
   }
+  db.malformed_ = CountMalformed(db.records_);
   if (reader.lastRecordCut()) {
     // Saving would write the cut record back and lose the rest of it.
     db.partial_ = true;

@@ -68,6 +68,10 @@ class RecordArena {
   size_t used_ = 0;
 };
 
+// How many of `records` are not well formed (RecordIsWellFormed), counted
+// as an open of a large file needs it: quickly.
+size_t CountMalformed(const std::vector<DataRecord>& records);
+
 // What a database file holds before its data records. Commands that show
 // only the header, the schema or the popup lists need no more than this,
 // and reading it costs the same whatever the number of records.
@@ -98,7 +102,7 @@ class Database {
   // that cannot be read is reported and ends the reading, yet the open
   // succeeds with the records before it; partial() then tells, and Save()
   // will not overwrite the original file.
-  Status Open(const std::string& path, UiPort& ui);
+  Status Open(const std::string& path, UiPort& ui, FileBuffer::Access access = FileBuffer::Access::kCopy);
   // The same open of a file's bytes already in memory (a database that
   // arrived from outside and is not stored yet), named `path`.
   Status OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui);

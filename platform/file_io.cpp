@@ -21,6 +21,9 @@ namespace cx {
 namespace {
 
 constexpr size_t kWriteBuffer = 1 << 16;
+// How much of a file to be flushed is written before it is sent on to the
+// disk.
+constexpr uint64_t kWriteBackStep = uint64_t{4} << 20;
 
 std::string ErrnoText() { return std::strerror(errno); }
 
@@ -159,12 +162,25 @@ FileBuffer::~FileBuffer() {
   if (data_) ::munmap(data_, mapped_);
 }
 
-bool FileBuffer::Read(const std::string& path) {
+bool FileBuffer::Read(const std::string& path, Access access) {
   constexpr size_t kHugePage = 2u << 20;
   struct stat st{};
   int fd = OpenRegular(path, &st);
   if (fd < 0) return false;
   size_t want = static_cast<size_t>(st.st_size);
+  if (access == Access::kMap && want > 0) {
+    // All pages at once: one by one, each first touch would fault.
+    void* block = ::mmap(nullptr, want, PROT_READ, MAP_PRIVATE | MAP_POPULATE, fd, 0);
+    if (block != MAP_FAILED) {
+      ::close(fd);
+      if (data_) ::munmap(data_, mapped_);
+      data_ = static_cast<uint8_t*>(block);
+      size_ = want;
+      mapped_ = want;
+      state_ = StateOf(st);
+      return true;
+    }
+  }
   size_t mapped = (want + kHugePage - 1) / kHugePage * kHugePage;
   if (mapped == 0) mapped = kHugePage;
   void* block = ::mmap(nullptr, mapped, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
@@ -283,6 +299,7 @@ Status SafeFileWriter::Fail(const std::string& what) {
 
 Status SafeFileWriter::Open() {
   written_.reset();
+  writtenBytes_ = startedBytes_ = 0;
   if (!ResolveLinks(target_, real_)) return Fail("Cannot follow the link " + target_);
   const size_t slash = real_.rfind('/');
   const std::string folder = slash == std::string::npos ? "" : real_.substr(0, slash + 1);
@@ -363,6 +380,17 @@ bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
     }
     done += static_cast<size_t>(n);
   }
+  writtenBytes_ += size;
+#if defined(__linux__)
+  // A file that will be flushed starts on its way to the disk while the
+  // rest is still being written, so that the flush at the end waits for
+  // the last part only. Only a start: the flush still decides.
+  if (options_.sync && !direct_ && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
+    ::sync_file_range(fd_, static_cast<off64_t>(startedBytes_),
+                      static_cast<off64_t>(writtenBytes_ - startedBytes_), SYNC_FILE_RANGE_WRITE);
+    startedBytes_ = writtenBytes_;
+  }
+#endif
   return true;
 }
 

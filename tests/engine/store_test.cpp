@@ -102,6 +102,31 @@ TEST_F(StoreTest, SavingTwiceWithoutChangeDiffersOnlyInDateAndDirtyBit) {
   EXPECT_EQ(ReadBytes(db.path()), second);
 }
 
+// A mapped open leaves the records as views of the file's own pages. The
+// save replaces that file, so the views must still read the old file's
+// bytes while they are written out, and after: saving twice, and saving an
+// edited copy, gives what a copied open gives.
+TEST_F(StoreTest, MappedOpenSavesOverItsOwnFileAsACopiedOpenDoes) {
+  Database made = MakeFilled("mapped.PDB");
+  ASSERT_TRUE(made.Save(FixedClock(1000)).ok());
+  Database copied;
+  ASSERT_TRUE(copied.Open(made.path(), ui, FileBuffer::Access::kCopy).ok());
+  ASSERT_TRUE(copied.SaveAs(dir.File("copied.PDB"), FixedClock(3000)).ok());
+
+  Database mapped;
+  ASSERT_TRUE(mapped.Open(made.path(), ui, FileBuffer::Access::kMap).ok());
+  ASSERT_TRUE(mapped.Save(FixedClock(2000)).ok());
+  ASSERT_TRUE(mapped.Save(FixedClock(3000)).ok());
+  EXPECT_EQ(ReadBytes(made.path()), ReadBytes(dir.File("copied.PDB")));
+  EXPECT_EQ(ValueString(*FieldValue(mapped.record(1), 0)), "two");
+
+  mapped.ReplaceRecord(0, SlotWriter().Text("uno").End().bytes);
+  copied.ReplaceRecord(0, SlotWriter().Text("uno").End().bytes);
+  ASSERT_TRUE(mapped.Save(FixedClock(4000)).ok());
+  ASSERT_TRUE(copied.Save(FixedClock(4000)).ok());
+  EXPECT_EQ(ReadBytes(made.path()), ReadBytes(dir.File("copied.PDB")));
+}
+
 TEST_F(StoreTest, DirtyBitLeavesOtherAttributeBitsAlone) {
   auto records = testing::StandardRecords();
   records[0].attributes = 0x4A;

@@ -7,6 +7,7 @@
 
 #include "engine/byte_order.h"
 #include "platform/file_io.h"
+#include "platform/large_block.h"
 
 namespace cx {
 
@@ -35,7 +36,7 @@ std::pair<std::shared_ptr<const uint8_t[]>, ByteView> RecordArena::Copy(ByteView
   if (!block_ || used_ + bytes.size() > size_) {
     size_ = block_ ? std::min(size_ * 2, kLargestBlock) : kFirstBlock;
     size_ = std::max(size_, bytes.size());
-    block_ = std::make_shared_for_overwrite<uint8_t[]>(size_);
+    block_ = size_ >= kLargePage ? AllocateLargeBlock(size_) : std::make_shared_for_overwrite<uint8_t[]>(size_);
     used_ = 0;
   }
   uint8_t* at = block_.get() + used_;

@@ -62,7 +62,8 @@ class RecordArena {
 
  private:
   static constexpr size_t kFirstBlock = size_t{8} << 10;
-  static constexpr size_t kLargestBlock = size_t{1} << 20;
+  // Blocks this large come in large pages (AllocateLargeBlock).
+  static constexpr size_t kLargestBlock = size_t{4} << 20;
   std::shared_ptr<uint8_t[]> block_;
   size_t size_ = 0;
   size_t used_ = 0;

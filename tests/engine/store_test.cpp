@@ -303,14 +303,15 @@ TEST_F(StoreTest, AddingStopsAtTheRecordLimit) {
 TEST_F(StoreTest, RecordsCopiedThroughAnArenaOutliveItAndEachOther) {
   Database db = Database::CreateNew(dir.File("arena.PDB"), "arena");
   db.schema() = testing::SchemaOf({FieldType::Unique, FieldType::Text});
-  constexpr int kRecords = 400;  // enough to fill blocks of several sizes
+  // About 4 MB of copies: blocks of every size, the largest in large pages.
+  constexpr int kRecords = 4000;
   for (int i = 0; i < kRecords; ++i) db.AppendRecord(SlotWriter().Number(i + 1).End().bytes);
   const uint32_t next = db.NextUniqueNumber();
   std::vector<ByteVector> expected(kRecords);
   {
     RecordArena arena;
     for (int i = 0; i < kRecords; ++i) {
-      expected[i] = SlotWriter().Number(i + 1).Text(std::string(i % 97 + 1, char('a' + i % 26))).End().bytes;
+      expected[i] = SlotWriter().Number(i + 1).Text(std::string(i * 37 % 2000 + 1, char('a' + i % 26))).End().bytes;
       db.ReplaceRecord(i, ByteView(expected[i]), arena);
     }
     // A number past the next one moves it on, as any replacement does.

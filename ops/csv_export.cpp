@@ -1,8 +1,10 @@
 #include "ops/csv_export.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <cstring>
 #include <optional>
+#include <vector>
 
 #if defined(__SSE2__)
 #include <emmintrin.h>
@@ -57,6 +59,45 @@ size_t FirstSpecial(std::string_view text, char separator) {
 #endif
   for (; i < text.size(); ++i) {
     if (special(text[i])) return i;
+  }
+  return std::string_view::npos;
+}
+
+// Where a stored value first holds a zero byte (its end) or a byte that
+// would need quotes, or npos. One pass over the record's own bytes tells
+// whether the text can be copied out as it is.
+size_t FirstStop(std::string_view text, char separator) {
+  auto stop = [separator](char c) {
+    return c == '\0' || c == csv::kQuote || c == separator || c == '\r' || c == '\n';
+  };
+  size_t i = 0;
+#if defined(__SSE2__)
+  if (text.size() >= 16) {
+    const __m128i zero = _mm_setzero_si128();
+    const __m128i quote = _mm_set1_epi8(csv::kQuote);
+    const __m128i sep = _mm_set1_epi8(separator);
+    const __m128i cr = _mm_set1_epi8('\r');
+    const __m128i lf = _mm_set1_epi8('\n');
+    auto hits = [&](size_t at) {
+      const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + at));
+      const __m128i any = _mm_or_si128(
+          _mm_or_si128(_mm_cmpeq_epi8(v, zero), _mm_cmpeq_epi8(v, quote)),
+          _mm_or_si128(_mm_cmpeq_epi8(v, sep), _mm_or_si128(_mm_cmpeq_epi8(v, cr), _mm_cmpeq_epi8(v, lf))));
+      return static_cast<unsigned>(_mm_movemask_epi8(any));
+    };
+    for (; i + 16 <= text.size(); i += 16) {
+      if (unsigned mask = hits(i)) return i + static_cast<size_t>(__builtin_ctz(mask));
+    }
+    // Never a load past the value's end: the value may end its file image.
+    if (i < text.size()) {
+      const size_t at = text.size() - 16;
+      if (unsigned mask = hits(at)) return at + static_cast<size_t>(__builtin_ctz(mask));
+    }
+    return std::string_view::npos;
+  }
+#endif
+  for (; i < text.size(); ++i) {
+    if (stop(text[i])) return i;
   }
   return std::string_view::npos;
 }
@@ -123,6 +164,23 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
     pending.clear();
   }
 
+  // The columns of every line, worked out once.
+  struct Column {
+    int slot;
+    bool separatorBefore;
+    bool image;        // an empty column
+    bool storedBytes;  // text is the stored bytes (ShowsStoredBytes)
+  };
+  std::vector<Column> columns;
+  for (int pos = 0; pos < format::kFieldCount; ++pos) {
+    const int slot = SlotAt(schema, pos, options.fieldNumberOrder);
+    if (IsNotUsed(schema, slot)) continue;
+    columns.push_back({slot, pos != 0, schema.field[slot].type() == FieldType::Image,
+                       values.ShowsStoredBytes(slot)});
+  }
+  std::string noValue;
+  QuoteCsvValue("No Value", noValue, options.quoteAll, settings.separator);
+
   std::optional<ViewTester> view;
   if (options.filteredOnly) view.emplace(db, link);
   const size_t count = db.recordCount();
@@ -139,19 +197,33 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
       continue;
     }
     const auto fieldValues = FieldValues(record);
-    for (int pos = 0; pos < format::kFieldCount; ++pos) {
-      int slot = SlotAt(schema, pos, options.fieldNumberOrder);
-      if (IsNotUsed(schema, slot)) continue;
-      if (pos != 0) pending.push_back(settings.separator);
-      if (schema.field[slot].type() == FieldType::Image) continue;
-      // Most values need no quotes: they are formatted in place and only
-      // the rare one that does is taken out again and quoted.
+    for (const Column& column : columns) {
+      if (column.separatorBefore) pending.push_back(settings.separator);
+      if (column.image) continue;
+      const std::optional<ByteView>& stored = fieldValues[column.slot];
+      if (column.storedBytes && stored && !options.quoteAll) {
+        // Most texts need no quotes and are copied straight from the record.
+        const std::string_view bytes(reinterpret_cast<const char*>(stored->data()), stored->size());
+        const size_t stop = FirstStop(bytes, settings.separator);
+        if (stop == std::string_view::npos || bytes[stop] == '\0') {
+          const size_t length = std::min(stop == std::string_view::npos ? bytes.size() : stop,
+                                         csv::kMaxValueText);
+          if (length == 0) {
+            pending += noValue;
+          } else {
+            pending.append(bytes.data(), length);
+          }
+          continue;
+        }
+      }
+      // The others are formatted in place, and only the rare one that
+      // needs quotes is taken out again and quoted.
       const size_t start = pending.size();
-      values.Append(slot, fieldValues[slot], pending);
+      values.Append(column.slot, stored, pending);
       if (pending.size() - start > csv::kMaxValueText) pending.resize(start + csv::kMaxValueText);
       const std::string_view value(pending.data() + start, pending.size() - start);
       if (value.empty()) {
-        QuoteCsvValue("No Value", pending, options.quoteAll, settings.separator);
+        pending += noValue;
       } else if (options.quoteAll || FirstSpecial(value, settings.separator) != std::string_view::npos) {
         text.assign(value);
         pending.resize(start);

@@ -1,6 +1,10 @@
 #include "ops/csv_export.h"
 
 #include <algorithm>
+#include <array>
+#include <condition_variable>
+#include <mutex>
+#include <thread>
 #include <cstdio>
 #include <cstring>
 #include <optional>
@@ -104,6 +108,96 @@ size_t FirstStop(std::string_view text, char separator) {
 
 constexpr size_t kWriteBlock = size_t{1} << 16;
 
+// Exports of this many records and more format their lines on two
+// threads: a large export takes a good part of a second on one.
+constexpr size_t kParallelRecords = 4096;
+
+// Formats the lines of the records `indexes` in groups, on this thread and
+// one more, and writes the groups in order from this thread. A group's
+// buffer is reused once it is written, so memory stays at a few groups
+// whatever the size of the export. `reportEmpty` is called, on this
+// thread and in order, for records without bytes. False when a write
+// failed.
+template <typename AppendLine, typename ReportEmpty>
+bool FormatInTwoThreads(const std::vector<uint32_t>& indexes, const Database& db,
+                        AppendLine& appendLine, ReportEmpty& reportEmpty, TextSink& out) {
+  constexpr size_t kGroup = 1024;    // records
+  constexpr size_t kInFlight = 4;    // groups formatted ahead of the writing
+  struct Group {
+    std::string lines;
+    std::string text;
+    std::vector<uint32_t> empty;  // records without bytes
+    bool ready = false;
+  };
+  const size_t groups = (indexes.size() + kGroup - 1) / kGroup;
+  std::array<Group, kInFlight> slots;
+  std::mutex mutex;
+  std::condition_variable changed;
+  size_t next = 0;     // the next group to format
+  size_t written = 0;  // groups written so far
+  bool ok = true;
+
+  auto format = [&](size_t g) {
+    Group& group = slots[g % kInFlight];
+    group.lines.clear();
+    group.empty.clear();
+    const size_t end = std::min(indexes.size(), (g + 1) * kGroup);
+    for (size_t i = g * kGroup; i < end; ++i) {
+      const ByteView record = db.record(indexes[i]);
+      if (record.empty()) {
+        group.empty.push_back(indexes[i]);
+      } else {
+        appendLine(record, group.lines, group.text);
+      }
+    }
+  };
+  // Takes the next group that may be formatted now, waiting while all
+  // buffers hold groups not yet written; false when none is left.
+  auto take = [&](std::unique_lock<std::mutex>& lock, size_t& g) {
+    changed.wait(lock, [&] { return next >= groups || next < written + kInFlight; });
+    if (next >= groups) return false;
+    g = next++;
+    return true;
+  };
+
+  std::thread helper([&] {
+    std::unique_lock<std::mutex> lock(mutex);
+    size_t g = 0;
+    while (take(lock, g)) {
+      lock.unlock();
+      format(g);
+      lock.lock();
+      slots[g % kInFlight].ready = true;
+      changed.notify_all();
+    }
+  });
+  std::unique_lock<std::mutex> lock(mutex);
+  while (written < groups) {
+    Group& due = slots[written % kInFlight];
+    size_t g = 0;
+    if (!due.ready && next < groups && next < written + kInFlight) {
+      take(lock, g);
+      lock.unlock();
+      format(g);
+      lock.lock();
+      slots[g % kInFlight].ready = true;
+      changed.notify_all();
+      continue;
+    }
+    changed.wait(lock, [&] { return due.ready; });
+    lock.unlock();
+    for (uint32_t index : due.empty) reportEmpty(index);
+    if (!due.lines.empty() && !out.Write(due.lines)) ok = false;
+    lock.lock();
+    due.ready = false;
+    ++written;
+    changed.notify_all();
+  }
+  lock.unlock();
+  helper.join();
+  return ok;
+}
+
 bool IsNotUsed(const Schema& schema, int slot) {
   return slot >= format::kFieldCount || schema.field[slot].type() == FieldType::NotUsed;
 }
@@ -181,24 +275,12 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
   std::string noValue;
   QuoteCsvValue("No Value", noValue, options.quoteAll, settings.separator);
 
-  std::optional<ViewTester> view;
-  if (options.filteredOnly) view.emplace(db, link);
-  const size_t count = db.recordCount();
-  for (size_t index = 0; index < count; ++index) {
-    if (view && !view->InView(index)) continue;
-    if (ui.WantsStatus()) {
-      ui.Status(Printf("Reading and Writing Record %ld...", static_cast<long>(index)));
-      ui.Status(Printf("Reading Record: %ld:", static_cast<long>(index) - 30));
-    }
-    ByteView record = db.record(index);
-    if (record.empty()) {
-      ui.Status(Printf("ERROR:Reading Record: %ld", static_cast<long>(index)));
-      result = 0;
-      continue;
-    }
+  // One record's line, appended to `lines`; `text` is room for a value
+  // being quoted. Reads only the database, so two threads may run it.
+  auto appendLine = [&](ByteView record, std::string& lines, std::string& text) {
     const auto fieldValues = FieldValues(record);
     for (const Column& column : columns) {
-      if (column.separatorBefore) pending.push_back(settings.separator);
+      if (column.separatorBefore) lines.push_back(settings.separator);
       if (column.image) continue;
       const std::optional<ByteView>& stored = fieldValues[column.slot];
       if (column.storedBytes && stored && !options.quoteAll) {
@@ -209,28 +291,58 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
           const size_t length = std::min(stop == std::string_view::npos ? bytes.size() : stop,
                                          csv::kMaxValueText);
           if (length == 0) {
-            pending += noValue;
+            lines += noValue;
           } else {
-            pending.append(bytes.data(), length);
+            lines.append(bytes.data(), length);
           }
           continue;
         }
       }
       // The others are formatted in place, and only the rare one that
       // needs quotes is taken out again and quoted.
-      const size_t start = pending.size();
-      values.Append(column.slot, stored, pending);
-      if (pending.size() - start > csv::kMaxValueText) pending.resize(start + csv::kMaxValueText);
-      const std::string_view value(pending.data() + start, pending.size() - start);
+      const size_t start = lines.size();
+      values.Append(column.slot, stored, lines);
+      if (lines.size() - start > csv::kMaxValueText) lines.resize(start + csv::kMaxValueText);
+      const std::string_view value(lines.data() + start, lines.size() - start);
       if (value.empty()) {
-        pending += noValue;
+        lines += noValue;
       } else if (options.quoteAll || FirstSpecial(value, settings.separator) != std::string_view::npos) {
         text.assign(value);
-        pending.resize(start);
-        QuoteCsvValue(text, pending, options.quoteAll, settings.separator);
+        lines.resize(start);
+        QuoteCsvValue(text, lines, options.quoteAll, settings.separator);
       }
     }
-    pending.push_back(csv::kLineEnd);
+    lines.push_back(csv::kLineEnd);
+  };
+  auto reportEmpty = [&](size_t index) {
+    ui.Status(Printf("ERROR:Reading Record: %ld", static_cast<long>(index)));
+    result = 0;
+  };
+
+  std::optional<ViewTester> view;
+  if (options.filteredOnly) view.emplace(db, link);
+  const size_t count = db.recordCount();
+  if (!ui.WantsStatus() && count >= kParallelRecords && std::thread::hardware_concurrency() > 1) {
+    std::vector<uint32_t> indexes;
+    indexes.reserve(count);
+    for (size_t index = 0; index < count; ++index) {
+      if (!view || view->InView(index)) indexes.push_back(static_cast<uint32_t>(index));
+    }
+    if (!FormatInTwoThreads(indexes, db, appendLine, reportEmpty, out)) result = 0;
+    return result;
+  }
+  for (size_t index = 0; index < count; ++index) {
+    if (view && !view->InView(index)) continue;
+    if (ui.WantsStatus()) {
+      ui.Status(Printf("Reading and Writing Record %ld...", static_cast<long>(index)));
+      ui.Status(Printf("Reading Record: %ld:", static_cast<long>(index) - 30));
+    }
+    ByteView record = db.record(index);
+    if (record.empty()) {
+      reportEmpty(index);
+      continue;
+    }
+    appendLine(record, pending, text);
     // Lines go out in blocks: one write per line would copy every byte
     // once more into the sink's own buffer.
     if (pending.size() >= kWriteBlock) {

@@ -338,6 +338,7 @@ Status SafeFileWriter::Open() {
     return Status::Error("Cannot write " + target_ + ": the file is read-only");
   }
 
+  replacing_ = exists;
   const std::string dir = DirectoryOf(real_);
   const std::string prefix = TemporaryPrefix(name, NameLimit(dir));
   RemoveDeadTemporaries(dir, prefix);
@@ -384,8 +385,12 @@ bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
 #if defined(__linux__)
   // A file that will be flushed starts on its way to the disk while the
   // rest is still being written, so that the flush at the end waits for
-  // the last part only. Only a start: the flush still decides.
-  if (options_.sync && !direct_ && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
+  // the last part only. Only a start: the flush still decides. The same
+  // holds for one that replaces a file without a flush: renaming it over
+  // the old one makes the file system send all of it on its way then (lest
+  // a crash leave an empty file where the old one was), all at once at the
+  // end unless it was started on the way.
+  if ((options_.sync || replacing_) && !direct_ && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
     ::sync_file_range(fd_, static_cast<off64_t>(startedBytes_),
                       static_cast<off64_t>(writtenBytes_ - startedBytes_), SYNC_FILE_RANGE_WRITE);
     startedBytes_ = writtenBytes_;

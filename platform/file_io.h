@@ -131,6 +131,7 @@ class SafeFileWriter {
   std::string temp_;
   int fd_ = -1;
   bool direct_ = false;
+  bool replacing_ = false;  // a file of the target's name exists
   Options options_;
   bool failed_ = false;
   std::string error_;

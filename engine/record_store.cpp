@@ -169,7 +169,7 @@ std::string FormatMessage(const char* pattern, long number) {
 
 Database::Database() : schema_(InitSchema()) {}
 
-size_t CountMalformed(const std::vector<DataRecord>& records) {
+size_t CountMalformed(const RecordTable& records) {
   // Each slot's length tells where the next one lies, so one record's walk
   // is a chain of loads that wait for each other. Four records walked side
   // by side let those waits overlap.

@@ -29,6 +29,7 @@ class TextRanks {
     at_.push_back({prefix, row, static_cast<uint32_t>(buffer_.size()), static_cast<uint32_t>(text.size())});
     for (char c : text) buffer_.push_back(LowerAscii(c));
   }
+  void Reserve(size_t texts) { at_.reserve(texts); }
   // Calls set(row, rank) for every text added.
   template <typename Set>
   void Assign(Set set) {
@@ -50,7 +51,7 @@ class TextRanks {
     uint64_t prefix;
     uint32_t row, offset, length;
   };
-  std::vector<Entry> at_;
+  std::vector<Entry, LargePageAllocator<Entry>> at_;
   std::string buffer_;
 };
 
@@ -105,6 +106,13 @@ class SortKeyReader {
 
   int field() const { return field_; }
   Rule rule() const { return rule_; }
+  // Room for the texts of `records` records, taken at once.
+  void Reserve(size_t records) {
+    if (type_ == FieldType::Text || type_ == FieldType::Note || type_ == FieldType::DBPopup ||
+        type_ == FieldType::Linked) {
+      texts_.Reserve(records);
+    }
+  }
 
   void Read(ByteView value, int k, SortKeyTable::Row& row) {
     row.state[k] = 1;
@@ -153,7 +161,7 @@ class SortKeyReader {
 
   // Texts become their ranks once every row has been read; the rows are
   // still in record order, so a record index is a row index.
-  void Finish(int k, std::vector<SortKeyTable::Row>& rows) {
+  void Finish(int k, SortKeyTable::Rows& rows) {
     texts_.Assign([&](uint32_t record, int64_t rank) { rows[record].value[k].number = rank; });
   }
 
@@ -180,6 +188,7 @@ SortKeyTable::SortKeyTable(const Database& db) {
   // One pass over the records, reading every key from a record while its
   // bytes are at hand.
   const size_t count = db.recordCount();
+  for (SortKeyReader& reader : readers) reader.Reserve(count);
   rows_.resize(count);
   for (size_t i = 0; i < count; ++i) {
     Row& row = rows_[i];

@@ -251,7 +251,7 @@ TEST(CountMalformedTest, AgreesWithTheCheckOfEachRecord) {
       SlotWriter(true).Text("ext").End().bytes,
       {0, 0x02, 0x00, 'x', 'y', 0x05},         // a length cut in half
   };
-  std::vector<DataRecord> records;
+  RecordTable records;
   size_t expected = 0;
   for (size_t n = 0; n < 61; ++n) {
     // Steps of 3 through 7 kinds put every kind in every lane.
@@ -260,7 +260,7 @@ TEST(CountMalformedTest, AgreesWithTheCheckOfEachRecord) {
     if (!RecordIsWellFormed(records.back().bytes())) ++expected;
     EXPECT_EQ(CountMalformed(records), expected) << n + 1 << " records";
   }
-  std::vector<DataRecord> full(30);
+  RecordTable full(30);
   ByteVector all;
   all.push_back(0);
   for (int slot = 0; slot < format::kFieldCount; ++slot) all.insert(all.end(), {1, 0, 'v'});

@@ -22,7 +22,7 @@ using testing::TimeVal;
 // slots on every call. SortAll, which compares rows of prepared keys
 // instead, must put the records in exactly this order.
 void ReferenceSortAll(Database& db) {
-  std::vector<DataRecord>& t = db.table();
+  RecordTable& t = db.table();
   const long n = static_cast<long>(t.size());
   if (db.schema().sortKey[0].Field() == -1 || n < 2) return;
   SortPositions(

@@ -267,6 +267,14 @@ TEST(CountMalformedTest, AgreesWithTheCheckOfEachRecord) {
   all.insert(all.end(), {0x40, 0x00});  // past the last slot: never read
   for (DataRecord& r : full) r = DataRecord(all, 0, 0);
   EXPECT_EQ(CountMalformed(full), 0u);
+
+  // A large file is checked in two halves; bad records on either side of
+  // the middle and at both ends all count.
+  RecordTable large(20001, DataRecord(kinds[1], 0, 0));
+  for (size_t at : {size_t{0}, size_t{9999}, size_t{10000}, size_t{10001}, size_t{20000}}) {
+    large[at] = DataRecord(kinds[3], 0, 0);
+  }
+  EXPECT_EQ(CountMalformed(large), 5u);
 }
 
 }  // namespace

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <string>
 #include <string_view>
+#include <thread>
 
 #include "ops/database_settings.h"
 #include "ops/field_values.h"
@@ -30,6 +31,7 @@ class TextRanks {
     for (char c : text) buffer_.push_back(LowerAscii(c));
   }
   void Reserve(size_t texts) { at_.reserve(texts); }
+  size_t size() const { return at_.size(); }
   // Calls set(row, rank) for every text added.
   template <typename Set>
   void Assign(Set set) {
@@ -54,6 +56,10 @@ class TextRanks {
   std::vector<Entry, LargePageAllocator<Entry>> at_;
   std::string buffer_;
 };
+
+// Below this many texts a key's ranking is done sooner than a thread is
+// started for it.
+constexpr size_t kTextsRankedAside = 8192;
 
 }  // namespace
 
@@ -164,6 +170,7 @@ class SortKeyReader {
   void Finish(int k, SortKeyTable::Rows& rows) {
     texts_.Assign([&](uint32_t record, int64_t rank) { rows[record].value[k].number = rank; });
   }
+  size_t texts() const { return texts_.size(); }
 
  private:
   int field_;
@@ -199,7 +206,24 @@ SortKeyTable::SortKeyTable(const Database& db) {
       if (std::optional<ByteView> value = FieldValue(record, readers[k].field())) readers[k].Read(*value, k, row);
     }
   }
-  for (int k = 0; k < keys_; ++k) readers[k].Finish(k, rows_);
+  // Ranking a key's texts sorts them; of two such keys in a large file,
+  // the first is ranked on a second thread. Each writes only its own key
+  // of the rows.
+  int aside = -1;
+  for (int k = 0; k < keys_ && aside < 0; ++k) {
+    if (readers[k].texts() < kTextsRankedAside) continue;
+    for (int other = k + 1; other < keys_; ++other) {
+      if (readers[other].texts() >= kTextsRankedAside) aside = k;
+    }
+  }
+  std::thread helper;
+  if (aside >= 0 && std::thread::hardware_concurrency() > 1) {
+    helper = std::thread([&readers, aside, this] { readers[aside].Finish(aside, rows_); });
+  }
+  for (int k = 0; k < keys_; ++k) {
+    if (k != aside || !helper.joinable()) readers[k].Finish(k, rows_);
+  }
+  if (helper.joinable()) helper.join();
 }
 
 int SortKeyTable::Compare(const Row& rowA, const Row& rowB) const {

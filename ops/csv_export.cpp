@@ -3,11 +3,11 @@
 #include <algorithm>
 #include <array>
 #include <condition_variable>
-#include <mutex>
-#include <thread>
 #include <cstdio>
 #include <cstring>
+#include <mutex>
 #include <optional>
+#include <thread>
 #include <vector>
 
 #if defined(__SSE2__)
@@ -204,12 +204,10 @@ bool IsNotUsed(const Schema& schema, int slot) {
 
 }  // namespace
 
-void QuoteCsvValue(std::string_view text, std::string& out, bool quoteAll, char separator) {
-  if (text.empty()) {
-    if (quoteAll) out += "\"\"";
-    return;
-  }
-  const size_t first = FirstSpecial(text, separator);
+namespace {
+
+// QuoteCsvValue of a text not empty whose first special byte is known.
+void QuoteFrom(std::string_view text, size_t first, std::string& out, bool quoteAll) {
   const bool wrap = quoteAll || first != std::string_view::npos;
   const bool quotes = first != std::string_view::npos &&
                       std::memchr(text.data() + first, csv::kQuote, text.size() - first) != nullptr;
@@ -230,6 +228,16 @@ void QuoteCsvValue(std::string_view text, std::string& out, bool quoteAll, char 
     }
   }
   if (wrap) out.push_back(csv::kQuote);
+}
+
+}  // namespace
+
+void QuoteCsvValue(std::string_view text, std::string& out, bool quoteAll, char separator) {
+  if (text.empty()) {
+    if (quoteAll) out += "\"\"";
+    return;
+  }
+  QuoteFrom(text, FirstSpecial(text, separator), out, quoteAll);
 }
 
 int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& out,
@@ -287,16 +295,20 @@ int ExportCsvTo(const Database& db, const CsvExportOptions& options, TextSink& o
         // Most texts need no quotes and are copied straight from the record.
         const std::string_view bytes(reinterpret_cast<const char*>(stored->data()), stored->size());
         const size_t stop = FirstStop(bytes, settings.separator);
-        if (stop == std::string_view::npos || bytes[stop] == '\0') {
-          const size_t length = std::min(stop == std::string_view::npos ? bytes.size() : stop,
-                                         csv::kMaxValueText);
-          if (length == 0) {
-            lines += noValue;
-          } else {
-            lines.append(bytes.data(), length);
-          }
-          continue;
+        size_t length = stop == std::string_view::npos ? bytes.size() : stop;
+        if (stop != std::string_view::npos && bytes[stop] != '\0') {
+          const void* end = std::memchr(bytes.data() + stop, 0, bytes.size() - stop);
+          length = end ? static_cast<size_t>(static_cast<const char*>(end) - bytes.data()) : bytes.size();
         }
+        length = std::min(length, csv::kMaxValueText);
+        if (length == 0) {
+          lines += noValue;
+        } else if (stop < length) {
+          QuoteFrom(bytes.substr(0, length), stop, lines, false);
+        } else {
+          lines.append(bytes.data(), length);
+        }
+        continue;
       }
       // The others are formatted in place, and only the rare one that
       // needs quotes is taken out again and quoted.

@@ -4,6 +4,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "engine/byte_order.h"
 #include "ops/csv_export.h"
 #include "ops/csv_import.h"
 #include "ops/csv_reader.h"
@@ -302,6 +303,32 @@ TEST(CsvExportTest, FilteredOnlyFollowsTheViewAndFailuresReturnZero) {
   std::vector<uint8_t> bytes;
   ASSERT_TRUE(ReadWholeFile(dir.File("out.csv"), bytes));
   EXPECT_EQ(std::string(bytes.begin(), bytes.end()), "pen,3\n\"ink, blue\",-1\nNo Value,0\n");
+}
+
+// A value is cut to its first 4095 bytes before it is quoted: a byte that
+// needs quotes counts only when it survives the cut.
+TEST(CsvExportTest, LongValuesAreCutBeforeTheyAreQuoted) {
+  Database db = Database::CreateNew("/nonexistent/Long.PDB", "Long");
+  testing::DefineField(db.schema(), 0, FieldType::Note, "Notes");
+  std::string expected;
+  auto add = [&](const std::string& text) {
+    Bytes record = {0, 0, 0};
+    PutLE16(record.data() + 1, static_cast<uint16_t>(text.size() + 1));
+    record.insert(record.end(), text.begin(), text.end());
+    record.insert(record.end(), {0, 0xFF, 0xFF});
+    db.AppendRecord(record);
+    QuoteCsvValue(std::string_view(text).substr(0, 4095), expected, false, ',');
+    expected += "\n";
+  };
+  for (size_t at : {size_t{10}, size_t{4000}, size_t{4094}, size_t{4095}, size_t{4500}}) {
+    for (char special : {',', '"', '\n'}) {
+      std::string text(5000, 'w');
+      text[at] = special;
+      add(text);
+    }
+  }
+  add(std::string(5000, 'w'));
+  EXPECT_EQ(ExportToString(db, {}), expected);
 }
 
 // Large exports format groups of lines on two threads and write them in

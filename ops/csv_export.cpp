@@ -109,7 +109,8 @@ size_t FirstStop(std::string_view text, char separator) {
 constexpr size_t kWriteBlock = size_t{1} << 16;
 
 // Exports of this many records and more format their lines on two
-// threads: a large export takes a good part of a second on one.
+// threads: formatting is most of a large export's time, and below this a
+// second thread saves less than it costs to start.
 constexpr size_t kParallelRecords = 4096;
 
 // Formats the lines of the records `indexes` in groups, on this thread and

@@ -370,9 +370,18 @@ Status SafeFileWriter::Open() {
 }
 
 bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
+  // A file that will be flushed starts on its way to the disk while the
+  // rest is still being written, so that the flush at the end waits for
+  // the last part only. Only a start: the flush still decides. The same
+  // holds for one that replaces a file without a flush: renaming it over
+  // the old one makes the file system send all of it on its way then (lest
+  // a crash leave an empty file where the old one was), all at once at the
+  // end unless it was started on the way. A large block goes in steps.
+  const bool sendOn = (options_.sync || replacing_) && !direct_;
   size_t done = 0;
   while (done < size) {
-    ssize_t n = ::write(fd_, p + done, size - done);
+    const size_t step = sendOn ? std::min<size_t>(size - done, kWriteBackStep) : size - done;
+    ssize_t n = ::write(fd_, p + done, step);
     if (n < 0 && errno == EINTR) continue;
     if (n <= 0) {
       failed_ = true;
@@ -380,22 +389,15 @@ bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
       return false;
     }
     done += static_cast<size_t>(n);
-  }
-  writtenBytes_ += size;
+    writtenBytes_ += static_cast<uint64_t>(n);
 #if defined(__linux__)
-  // A file that will be flushed starts on its way to the disk while the
-  // rest is still being written, so that the flush at the end waits for
-  // the last part only. Only a start: the flush still decides. The same
-  // holds for one that replaces a file without a flush: renaming it over
-  // the old one makes the file system send all of it on its way then (lest
-  // a crash leave an empty file where the old one was), all at once at the
-  // end unless it was started on the way.
-  if ((options_.sync || replacing_) && !direct_ && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
-    ::sync_file_range(fd_, static_cast<off64_t>(startedBytes_),
-                      static_cast<off64_t>(writtenBytes_ - startedBytes_), SYNC_FILE_RANGE_WRITE);
-    startedBytes_ = writtenBytes_;
-  }
+    if (sendOn && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
+      ::sync_file_range(fd_, static_cast<off64_t>(startedBytes_),
+                        static_cast<off64_t>(writtenBytes_ - startedBytes_), SYNC_FILE_RANGE_WRITE);
+      startedBytes_ = writtenBytes_;
+    }
 #endif
+  }
   return true;
 }
 

@@ -185,12 +185,15 @@ size_t CountMalformedIn(const RecordTable& records, size_t first, size_t last) {
     int slot;
   };
   size_t malformed = 0;
+  // Each lane takes its own quarter of the records, so that the lanes read
+  // four places of the file image at once rather than one.
+  const size_t quarter = (last - first) / kLanes;
   size_t n = first;
-  for (; n + kLanes <= last; n += kLanes) {
+  for (; n < first + quarter; ++n) {
     Walk walk[kLanes];
     unsigned active = 0;
     for (size_t lane = 0; lane < kLanes; ++lane) {
-      const ByteView r = records[n + lane].bytes();
+      const ByteView r = records[n + lane * quarter].bytes();
       if (r.empty()) continue;
       const size_t off = DataStart(r);
       if (off > r.size()) {
@@ -222,7 +225,7 @@ size_t CountMalformedIn(const RecordTable& records, size_t first, size_t last) {
       }
     }
   }
-  for (; n < last; ++n) {
+  for (n = first + kLanes * quarter; n < last; ++n) {
     if (!RecordIsWellFormed(records[n].bytes())) ++malformed;
   }
   return malformed;

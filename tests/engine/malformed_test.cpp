@@ -238,9 +238,10 @@ TEST_F(MalformedFileTest, FewerThanThirtyOneRecords) {
   }
 }
 
-// The count at open walks several records side by side; whatever lane a
-// bad record falls in, and in the records left over after the last group,
-// it must agree with the records checked one by one.
+// The count at open walks several records side by side, each from its own
+// part of the file; whatever part a bad record falls in, and in the records
+// left over after the parts, it must agree with the records checked one by
+// one.
 TEST(CountMalformedTest, AgreesWithTheCheckOfEachRecord) {
   const std::vector<ByteVector> kinds = {
       {},                                      // no slots at all
@@ -254,7 +255,7 @@ TEST(CountMalformedTest, AgreesWithTheCheckOfEachRecord) {
   RecordTable records;
   size_t expected = 0;
   for (size_t n = 0; n < 61; ++n) {
-    // Steps of 3 through 7 kinds put every kind in every lane.
+    // Steps of 3 through 7 kinds give every lane every kind for some count.
     const ByteVector& bytes = kinds[(n * 3) % kinds.size()];
     records.emplace_back(bytes, 0, 0);
     if (!RecordIsWellFormed(records.back().bytes())) ++expected;

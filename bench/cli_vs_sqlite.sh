@@ -8,6 +8,10 @@
 #           recalculate, save) against sqlite3 writing the table again in
 #           ORDER BY city, quantity desc, name
 #   resave  `cardovex-cli resave FILE` against `cp FILE COPY && sync COPY`
+#   add     `cardovex-cli add FILE Name=... Quantity=...` (one record placed,
+#           recalculated, saved) against `cardovex-cli resave` of the same
+#           file; a file of 65503 records, since a full one takes no more,
+#           copied afresh before every run of either side
 #
 # The two sides of a step run alternately, RUNS times each (after one
 # untimed warm-up), so that a burst of load on a shared machine hits both.
@@ -31,6 +35,7 @@ trap 'rm -rf "$work"' EXIT INT TERM
 cx() { LC_ALL=C "$cli" --date-format M/d/yyyy --time-format "h:mm:ss tt" --decimal . "$@"; }
 
 "$gen" "$work/data.PDB" 65504 7 >/dev/null
+"$gen" "$work/room.PDB" 65503 7 >/dev/null
 cx export-csv "$work/data.PDB" "$work/data.csv" >/dev/null
 sqlite3 "$work/data.db" "create table items(name, quantity integer, price, color, paid, id, photo,
   born, at, customer, orderno, notes, details, supplier, total, running, city, rating);" \
@@ -61,6 +66,9 @@ sq_sort() {
 cx_resave() { cx resave "$work/data.PDB"; }
 cp_prep() { rm -f "$work/copy.PDB"; }
 cp_sync() { sh -c 'cp "$1" "$2" && sync "$2"' sh "$work/data.PDB" "$work/copy.PDB"; }
+add_prep() { cp "$work/room.PDB" "$work/add.PDB"; }
+cx_add() { cx add "$work/add.PDB" "Name=Zoe Bench" Quantity=4711; }
+cx_resave_room() { cx resave "$work/add.PDB"; }
 nothing() { :; }
 
 # step NAME CX_PREP CX OTHER_PREP OTHER
@@ -93,4 +101,5 @@ echo "|---|---:|---:|---:|---:|---:|---:|"
 step export nothing cx_export nothing sq_export
 step sort cx_sort_prep cx_sort sq_sort_prep sq_sort
 step resave nothing cx_resave cp_prep cp_sync
+step add add_prep cx_add add_prep cx_resave_room
 cmp -s "$work/data.csv" "$work/out.csv" || { echo "the export differs from the first one" >&2; exit 1; }

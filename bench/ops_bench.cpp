@@ -80,7 +80,7 @@ void PlainQuickSort(long count, Compare cmp, Swap swap) {
 }
 
 void PlainSortAll(Database& db) {
-  std::vector<DataRecord>& t = db.table();
+  RecordTable& t = db.table();
   PlainQuickSort(
       static_cast<long>(t.size()),
       [&](long x, long y) { return CompareRecords(db, t[x].bytes(), t[y].bytes()); },
@@ -130,7 +130,7 @@ Database AdversarialDatabase(long n) {
 template <typename Sort>
 void RunAdversarialSort(benchmark::State& state, Sort sort) {
   Database db = AdversarialDatabase(state.range(0));
-  const std::vector<DataRecord> unsorted = db.table();
+  const RecordTable unsorted = db.table();
   for (auto _ : state) {
     state.PauseTiming();
     db.table() = unsorted;
@@ -150,7 +150,7 @@ template <typename Sort>
 void RunSort(benchmark::State& state, Sort sort) {
   Database db = Generated(static_cast<size_t>(state.range(0)));
   ThreeKeys(db);
-  const std::vector<DataRecord> unsorted = db.table();
+  const RecordTable unsorted = db.table();
   for (auto _ : state) {
     state.PauseTiming();
     db.table() = unsorted;

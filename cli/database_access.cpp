@@ -70,7 +70,10 @@ bool OpenForCommand(Context& ctx, const std::string& given, DataSession& session
   const std::string path = LocateDatabase(given);
   if (!LockDatabases(ctx, {path})) return false;
   if (!CheckOpenAccess(path, ctx.ui)) return false;
-  return OpenDatabase(session, path).ok();
+  // The command ends within moments and holds the file's lock meanwhile, so
+  // the file's own cached pages can serve as its image; main() turns the
+  // fault of a file cut short by another program into an error.
+  return OpenDatabase(session, path, FileBuffer::Access::kMap).ok();
 }
 
 bool OpenHeadForCommand(Context& ctx, const std::string& given, DatabaseHead& head) {

@@ -1,4 +1,5 @@
 // cardovex-cli: the command-line companion of Cardovex.
+#include <signal.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -53,9 +54,27 @@ class StdoutBuffer : public std::streambuf {
   char buffer_[1 << 16];
 };
 
+// Databases are read through a mapping of the file (see OpenForCommand).
+// Should another program shorten one in the moment a command runs, reading
+// the lost part faults; the command then stops with an error rather than a
+// crash. A half-written copy it leaves beside a database is removed by the
+// next save of that database.
+void StopOnShortenedFile(int) {
+  static const char kMessage[] =
+      "cardovex-cli: a file was shortened by another program while it was being read; "
+      "the command was stopped and nothing was replaced\n";
+  ssize_t ignored = ::write(STDERR_FILENO, kMessage, sizeof kMessage - 1);
+  (void)ignored;
+  ::_exit(cx::cli::kExitFailed);
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
+  struct sigaction bus{};
+  bus.sa_handler = StopOnShortenedFile;
+  sigemptyset(&bus.sa_mask);
+  ::sigaction(SIGBUS, &bus, nullptr);
   std::vector<std::string> args(argv + 1, argv + argc);
   cx::cli::CliUi ui(std::cerr);
   StdoutBuffer buffer;

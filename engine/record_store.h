@@ -15,6 +15,7 @@
 #include "engine/schema.h"
 #include "platform/clock.h"
 #include "platform/file_io.h"
+#include "platform/large_block.h"
 #include "platform/status.h"
 #include "platform/ui_port.h"
 
@@ -62,11 +63,19 @@ class RecordArena {
 
  private:
   static constexpr size_t kFirstBlock = size_t{8} << 10;
-  static constexpr size_t kLargestBlock = size_t{1} << 20;
+  // Blocks this large come in large pages (AllocateLargeBlock).
+  static constexpr size_t kLargestBlock = size_t{4} << 20;
   std::shared_ptr<uint8_t[]> block_;
   size_t size_ = 0;
   size_t used_ = 0;
 };
+
+// Every data record of a file, in file order.
+using RecordTable = std::vector<DataRecord, LargePageAllocator<DataRecord>>;
+
+// How many of `records` are not well formed (RecordIsWellFormed), counted
+// as an open of a large file needs it: quickly.
+size_t CountMalformed(const RecordTable& records);
 
 // What a database file holds before its data records. Commands that show
 // only the header, the schema or the popup lists need no more than this,
@@ -98,7 +107,7 @@ class Database {
   // that cannot be read is reported and ends the reading, yet the open
   // succeeds with the records before it; partial() then tells, and Save()
   // will not overwrite the original file.
-  Status Open(const std::string& path, UiPort& ui);
+  Status Open(const std::string& path, UiPort& ui, FileBuffer::Access access = FileBuffer::Access::kCopy);
   // The same open of a file's bytes already in memory (a database that
   // arrived from outside and is not stored yet), named `path`.
   Status OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui);
@@ -135,8 +144,8 @@ class Database {
   ByteView record(size_t index) const { return records_[index].bytes(); }
   const DataRecord& entry(size_t index) const { return records_[index]; }
   // The record table, for operations that reorder it (sorting).
-  std::vector<DataRecord>& table() { return records_; }
-  const std::vector<DataRecord>& table() const { return records_; }
+  RecordTable& table() { return records_; }
+  const RecordTable& table() const { return records_; }
 
   // Adding is refused (false) when the database already holds 65504
   // records. New records get attributes 0 and unique id 0 unless given.
@@ -174,7 +183,7 @@ class Database {
   PopupLists popups_{};
   uint8_t schemaAttributes_ = 0;
   uint32_t schemaUniqueID_ = 0;
-  std::vector<DataRecord> records_;
+  RecordTable records_;
   std::shared_ptr<const void> image_;  // keeps the views of unchanged records alive
   // The file as read or last written; nothing for a database not yet on disk.
   std::optional<FileState> diskState_;

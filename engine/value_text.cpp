@@ -216,6 +216,23 @@ std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot) {
 
 namespace {
 
+bool ShowsStored(const FieldDef& field) {
+  switch (field.type()) {
+    case FieldType::Text:
+    case FieldType::Float:
+    case FieldType::Note:
+    case FieldType::DBPopup:
+      return true;
+    case FieldType::Calculated:
+      switch (field.resultFormat()) {
+        case 0: case 1: case 4: case 5: case 6: return true;
+        default: return false;
+      }
+    default:
+      return false;
+  }
+}
+
 // The one formatter behind ValueTextOf and ValueTextWriter; a layout not
 // given is read from the locale when a value needs it.
 void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteView> value,
@@ -231,6 +248,10 @@ void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteV
     const void* nul = v.empty() ? nullptr : std::memchr(p, 0, v.size());
     out.append(p, nul ? static_cast<const char*>(nul) - p : v.size());
   };
+  if (ShowsStored(field)) {
+    appendStored(*value);
+    return;
+  }
   auto appendDate = [&](uint32_t dayNumber) {
     if (date) {
       AppendDate(dayNumber, *date, out);
@@ -247,8 +268,7 @@ void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteV
     case FieldType::Float:
     case FieldType::Note:
     case FieldType::DBPopup:
-      appendStored(*value);
-      return;
+      return;  // shown as stored, above
     case FieldType::Integer:
     case FieldType::Unique:
     case FieldType::Link:
@@ -279,9 +299,6 @@ void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteV
     }
     case FieldType::Calculated: {
       switch (field.resultFormat()) {
-        case 0: case 1: case 4: case 5: case 6:
-          appendStored(*value);
-          return;
         case 2:
         case 3: {
           const std::string stored = ValueString(*value);
@@ -314,6 +331,10 @@ ValueTextWriter::ValueTextWriter(const ValueContext& ctx)
 
 void ValueTextWriter::Append(int fieldSlot, std::optional<ByteView> value, std::string& out) const {
   AppendValueText(ctx_, fieldSlot, value, &date_, &time_, out);
+}
+
+bool ValueTextWriter::ShowsStoredBytes(int fieldSlot) const {
+  return fieldSlot >= 0 && fieldSlot < format::kFieldCount && ShowsStored(ctx_.schema.field[fieldSlot]);
 }
 
 std::string OneLine(const std::string& text) {

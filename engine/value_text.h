@@ -35,6 +35,9 @@ class ValueTextWriter {
   explicit ValueTextWriter(const ValueContext& ctx);
   // Appends exactly what ValueTextOf(ctx, fieldSlot, value) returns.
   void Append(int fieldSlot, std::optional<ByteView> value, std::string& out) const;
+  // True when the text of a value the record holds in slot `fieldSlot` is
+  // its stored bytes up to the first zero byte, unchanged.
+  bool ShowsStoredBytes(int fieldSlot) const;
 
   // A short date or time pattern cut into its parts.
   struct Layout {

@@ -19,6 +19,46 @@ constexpr size_t kResultChars = 14;
 // How many records ahead a walk over the file asks memory for.
 constexpr size_t kPrefetchRecords = 2;
 
+// Where each slot of the record being worked on starts (FieldOffset of
+// every slot), found in one walk and moved along when a slot is resized. A
+// record's calculated fields read and write several slots each, and a walk
+// from the first slot for every one of them took longer than the
+// arithmetic.
+class SlotIndex {
+ public:
+  void Build(ByteView record) {
+    size_t off = DataStart(record);
+    int slot = 0;
+    for (; slot < format::kFieldCount; ++slot) {
+      if (off + 2 > record.size()) break;
+      const uint16_t len = GetLE16(record.data() + off);
+      if (len == format::kEndMark) break;
+      offset_[slot] = static_cast<int>(off + 2);
+      off += 2 + size_t{len};
+    }
+    for (; slot < format::kFieldCount; ++slot) offset_[slot] = -1;
+  }
+  int Offset(int slot) const { return slot >= 0 && slot < format::kFieldCount ? offset_[slot] : -1; }
+  // FieldValue(record, slot) of the record the index was built for.
+  std::optional<ByteView> Value(ByteView record, int slot) const {
+    const int off = Offset(slot);
+    if (off < 0) return std::nullopt;
+    const size_t len = GetLE16(record.data() + off - 2);
+    const size_t avail = record.size() - static_cast<size_t>(off);
+    return record.subspan(static_cast<size_t>(off), std::min(len, avail));
+  }
+  // Slot `slot` now takes `delta` bytes more: the slots after it moved by
+  // as much.
+  void Resized(int slot, std::ptrdiff_t delta) {
+    for (int s = slot + 1; s < format::kFieldCount; ++s) {
+      if (offset_[s] >= 0) offset_[s] += static_cast<int>(delta);
+    }
+  }
+
+ private:
+  std::array<int, format::kFieldCount> offset_{};
+};
+
 // What one pass needs besides the session: the view test prepared once and
 // the fields to evaluate, in display order.
 struct Pass {
@@ -26,8 +66,9 @@ struct Pass {
   ViewTester tester;
   std::vector<int> fields;
   // The record being worked on, kept between records so that a walk over
-  // the whole file does not allocate for each one.
+  // the whole file does not allocate for each one, and its slots.
   mutable Bytes work;
+  mutable SlotIndex slots;
 
   Pass(DataSession& s, bool onlyPrevRecordFields) : session(s), tester(s.db, s.Link()) {
     const Schema& schema = s.db.schema();
@@ -44,11 +85,13 @@ struct Pass {
 // Replaces the value of slot `field` of a stored record with `text` and its
 // NUL. A record that ends before the slot is first brought to its full
 // stored form, as writing it from the editor would.
-void StoreSlotText(Bytes& record, int field, std::string_view text, const Schema& schema) {
-  int at = FieldOffset(field, record);
+void StoreSlotText(Bytes& record, int field, std::string_view text, const Schema& schema,
+                   SlotIndex* index = nullptr) {
+  int at = index ? index->Offset(field) : FieldOffset(field, record);
   if (at < 0) {
     record = Compact(Expand(record, schema), schema);
     at = FieldOffset(field, record);
+    if (index) index->Build(record);
     if (at < 0) return;
   }
   const size_t start = static_cast<size_t>(at) - 2;
@@ -67,10 +110,15 @@ void StoreSlotText(Bytes& record, int field, std::string_view text, const Schema
   PutLE16(slot, static_cast<uint16_t>(text.size() + 1));
   std::copy(text.begin(), text.end(), slot + 2);
   slot[2 + text.size()] = 0;
+  // A value that ran past the record's end had no slots after it, and
+  // still has none: moving them along is right in either case.
+  if (index) index->Resized(field, static_cast<std::ptrdiff_t>(newSize) - static_cast<std::ptrdiff_t>(oldSize));
 }
 
+double OperandOf(const Database& db, std::optional<ByteView> value, int field);
+
 double Operand(const Pass& pass, const CalcOperand& op, const std::string& constant, ByteView record,
-               size_t index) {
+               const SlotIndex& slots, size_t index) {
   if (!op.IsField()) return ParseDouble(constant);
   const Database& db = pass.session.db;
   if (op.fromPrevious) {
@@ -81,23 +129,24 @@ double Operand(const Pass& pass, const CalcOperand& op, const std::string& const
     }
     return 0.0;
   }
-  return FieldOperandValue(db, record, op.field);
+  return OperandOf(db, slots.Value(record, op.field), op.field);
 }
 
-int Evaluate(const Pass& pass, int field, Bytes& record, size_t index) {
+// `slots` indexes `record` and is kept up to date with it.
+int Evaluate(const Pass& pass, int field, Bytes& record, SlotIndex& slots, size_t index) {
   DataSession& s = pass.session;
   const Schema& schema = s.db.schema();
   if (!IsCalculated(schema, field)) return -1;
   const FieldDef& def = schema.field[field];
-  const double a = Operand(pass, CalcOperand1(def), def.Constant1(), record, index);
-  const double b = Operand(pass, CalcOperand2(def), def.Constant2(), record, index);
+  const double a = Operand(pass, CalcOperand1(def), def.Constant1(), record, slots, index);
+  const double b = Operand(pass, CalcOperand2(def), def.Constant2(), record, slots, index);
   const std::string text = CalcResultText(ApplyOperation(def.calcOperation, a, b), def.resultFormat(), s.locale);
 
-  std::optional<ByteView> old = FieldValue(record, field);
+  std::optional<ByteView> old = slots.Value(record, field);
   if (!old || ValueView(*old) != text) s.calc.fieldChanged[field] = 1;
   const bool sameBytes = old && old->size() == text.size() + 1 &&
                          std::equal(text.begin(), text.end(), old->begin()) && (*old)[text.size()] == 0;
-  if (!sameBytes) StoreSlotText(record, field, text, schema);
+  if (!sameBytes) StoreSlotText(record, field, text, schema, &slots);
   return 0;
 }
 
@@ -108,7 +157,8 @@ int RecalculateWith(const Pass& pass, size_t index, RecordArena* arena = nullptr
   ByteView stored = db.record(index);
   Bytes& work = pass.work;
   work.assign(stored.begin(), stored.end());
-  for (int f : pass.fields) Evaluate(pass, f, work, index);
+  pass.slots.Build(work);
+  for (int f : pass.fields) Evaluate(pass, f, work, pass.slots, index);
   if (!std::equal(work.begin(), work.end(), stored.begin(), stored.end())) {
     if (arena) {
       db.ReplaceRecord(index, ByteView(work), *arena);
@@ -196,7 +246,12 @@ double ApplyOperation(int operation, double a, double b) {
 }
 
 double FieldOperandValue(const Database& db, ByteView record, int field) {
-  std::optional<ByteView> value = FieldValue(record, field);
+  return OperandOf(db, FieldValue(record, field), field);
+}
+
+namespace {
+
+double OperandOf(const Database& db, std::optional<ByteView> value, int field) {
   if (!value) return 0.0;
   switch (db.schema().field[field].type()) {
     case FieldType::Text:
@@ -226,6 +281,8 @@ double FieldOperandValue(const Database& db, ByteView record, int field) {
   }
 }
 
+}  // namespace
+
 std::string CalcResultText(double value, uint8_t resultFormat, const LocaleInfo& locale) {
   FieldDef def;
   def.typeNumber = static_cast<int16_t>(FieldType::Calculated);
@@ -237,7 +294,9 @@ std::string CalcResultText(double value, uint8_t resultFormat, const LocaleInfo&
 
 int EvaluateField(DataSession& session, int field, Bytes& record, size_t index) {
   Pass pass(session, false);
-  return Evaluate(pass, field, record, index);
+  SlotIndex slots;
+  slots.Build(record);
+  return Evaluate(pass, field, record, slots, index);
 }
 
 int RecalculateRecord(DataSession& session, size_t index) {

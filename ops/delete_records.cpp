@@ -25,7 +25,7 @@ size_t DeleteRecords(DataSession& session, DeleteScope scope, LinkedRecordDelete
     ++deleted;
   }
   if (deleted > 0) {
-    std::vector<DataRecord>& table = db.table();
+    RecordTable& table = db.table();
     size_t keep = 0;
     for (size_t i = 0; i < table.size(); ++i) {
       if (!doomed[i]) table[keep++] = std::move(table[i]);

@@ -27,8 +27,8 @@ PendingWork RunPendingWork(DataSession& session) {
   return PendingWork::None;
 }
 
-Status OpenDatabase(DataSession& session, const std::string& path) {
-  Status status = session.db.Open(path, session.ui);
+Status OpenDatabase(DataSession& session, const std::string& path, FileBuffer::Access access) {
+  Status status = session.db.Open(path, session.ui, access);
   if (!status) return status;
   session.calc = RecalcState{};
   session.found = FindHit{};

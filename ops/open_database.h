@@ -23,7 +23,8 @@ PendingWork RunPendingWork(DataSession& session);
 
 // OpenDatabase: Database::Open of `path` into the session's database
 // (messages through the session's port), then RunPendingWork and the view.
-// On failure the database is unchanged.
-Status OpenDatabase(DataSession& session, const std::string& path);
+// On failure the database is unchanged. `access` as FileBuffer::Read.
+Status OpenDatabase(DataSession& session, const std::string& path,
+                    FileBuffer::Access access = FileBuffer::Access::kCopy);
 
 }  // namespace cx

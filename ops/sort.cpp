@@ -56,12 +56,12 @@ void SortAll(Database& db) {
   const size_t count = db.recordCount();
   if (db.schema().sortKey[0].Field() == -1 || count < 2) return;
   SortKeyTable keys(db);
-  std::vector<SortKeyTable::Row>& rows = keys.rows();
+  SortKeyTable::Rows& rows = keys.rows();
   SortPositions(
       static_cast<long>(count), [&](long x, long y) { return keys.Compare(rows[x], rows[y]); },
       [&](long x, long y) { std::swap(rows[x], rows[y]); });
-  std::vector<DataRecord>& table = db.table();
-  std::vector<DataRecord> sorted;
+  RecordTable& table = db.table();
+  RecordTable sorted;
   sorted.reserve(count);
   for (const SortKeyTable::Row& row : rows) sorted.push_back(std::move(table[row.record]));
   table.swap(sorted);

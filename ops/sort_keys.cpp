@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <string>
 #include <string_view>
+#include <thread>
 
 #include "ops/database_settings.h"
 #include "ops/field_values.h"
@@ -29,6 +30,8 @@ class TextRanks {
     at_.push_back({prefix, row, static_cast<uint32_t>(buffer_.size()), static_cast<uint32_t>(text.size())});
     for (char c : text) buffer_.push_back(LowerAscii(c));
   }
+  void Reserve(size_t texts) { at_.reserve(texts); }
+  size_t size() const { return at_.size(); }
   // Calls set(row, rank) for every text added.
   template <typename Set>
   void Assign(Set set) {
@@ -50,9 +53,13 @@ class TextRanks {
     uint64_t prefix;
     uint32_t row, offset, length;
   };
-  std::vector<Entry> at_;
+  std::vector<Entry, LargePageAllocator<Entry>> at_;
   std::string buffer_;
 };
+
+// Below this many texts a key's ranking is done sooner than a thread is
+// started for it.
+constexpr size_t kTextsRankedAside = 8192;
 
 }  // namespace
 
@@ -105,6 +112,13 @@ class SortKeyReader {
 
   int field() const { return field_; }
   Rule rule() const { return rule_; }
+  // Room for the texts of `records` records, taken at once.
+  void Reserve(size_t records) {
+    if (type_ == FieldType::Text || type_ == FieldType::Note || type_ == FieldType::DBPopup ||
+        type_ == FieldType::Linked) {
+      texts_.Reserve(records);
+    }
+  }
 
   void Read(ByteView value, int k, SortKeyTable::Row& row) {
     row.state[k] = 1;
@@ -153,9 +167,10 @@ class SortKeyReader {
 
   // Texts become their ranks once every row has been read; the rows are
   // still in record order, so a record index is a row index.
-  void Finish(int k, std::vector<SortKeyTable::Row>& rows) {
+  void Finish(int k, SortKeyTable::Rows& rows) {
     texts_.Assign([&](uint32_t record, int64_t rank) { rows[record].value[k].number = rank; });
   }
+  size_t texts() const { return texts_.size(); }
 
  private:
   int field_;
@@ -180,6 +195,7 @@ SortKeyTable::SortKeyTable(const Database& db) {
   // One pass over the records, reading every key from a record while its
   // bytes are at hand.
   const size_t count = db.recordCount();
+  for (SortKeyReader& reader : readers) reader.Reserve(count);
   rows_.resize(count);
   for (size_t i = 0; i < count; ++i) {
     Row& row = rows_[i];
@@ -190,7 +206,24 @@ SortKeyTable::SortKeyTable(const Database& db) {
       if (std::optional<ByteView> value = FieldValue(record, readers[k].field())) readers[k].Read(*value, k, row);
     }
   }
-  for (int k = 0; k < keys_; ++k) readers[k].Finish(k, rows_);
+  // Ranking a key's texts sorts them; of two such keys in a large file,
+  // the first is ranked on a second thread. Each writes only its own key
+  // of the rows.
+  int aside = -1;
+  for (int k = 0; k < keys_ && aside < 0; ++k) {
+    if (readers[k].texts() < kTextsRankedAside) continue;
+    for (int other = k + 1; other < keys_; ++other) {
+      if (readers[other].texts() >= kTextsRankedAside) aside = k;
+    }
+  }
+  std::thread helper;
+  if (aside >= 0 && std::thread::hardware_concurrency() > 1) {
+    helper = std::thread([&readers, aside, this] { readers[aside].Finish(aside, rows_); });
+  }
+  for (int k = 0; k < keys_; ++k) {
+    if (k != aside || !helper.joinable()) readers[k].Finish(k, rows_);
+  }
+  if (helper.joinable()) helper.join();
 }
 
 int SortKeyTable::Compare(const Row& rowA, const Row& rowB) const {

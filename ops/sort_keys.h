@@ -33,7 +33,8 @@ class SortKeyTable {
   // every record of the table.
   explicit SortKeyTable(const Database& db);
 
-  std::vector<Row>& rows() { return rows_; }
+  using Rows = std::vector<Row, LargePageAllocator<Row>>;
+  Rows& rows() { return rows_; }
   int Compare(const Row& a, const Row& b) const;
 
  private:
@@ -41,7 +42,7 @@ class SortKeyTable {
   enum class Rule : uint8_t { Equal, Wrapped, Ordered, Real, LinkedRank };
   friend class SortKeyReader;
 
-  std::vector<Row> rows_;
+  Rows rows_;
   int keys_ = 0;
   std::array<Rule, 3> rule_{};
   std::array<bool, 3> reverse_{};

@@ -2,11 +2,57 @@
 
 #include <array>
 #include <cctype>
+#include <cstdint>
 #include <cstdio>
+#include <cstring>
 
 #include "platform/text_codec.h"
 
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
+
 namespace cx {
+namespace {
+
+// The UTF-8 form of a Windows-1252 byte from 0x80 up (two or three bytes).
+struct WideByte {
+  uint8_t size = 0;
+  char bytes[3] = {0, 0, 0};
+};
+
+const std::array<WideByte, 128>& HighBytes() {
+  static const std::array<WideByte, 128> table = [] {
+    std::array<WideByte, 128> t;
+    for (int b = 0; b < 128; ++b) {
+      const std::string wide = Cp1252ToUtf8(std::string(1, static_cast<char>(b + 0x80)));
+      t[b].size = static_cast<uint8_t>(wide.size());
+      std::memcpy(t[b].bytes, wide.data(), wide.size());
+    }
+    return t;
+  }();
+  return table;
+}
+
+// Where the first byte from 0x80 up lies at or after `from`, or the size.
+// Export text is nearly all ASCII, so it is scanned 16 bytes at a time.
+size_t FirstHighByte(std::string_view text, size_t from) {
+  size_t i = from;
+#if defined(__SSE2__)
+  for (; i + 16 <= text.size(); i += 16) {
+    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + i));
+    if (const unsigned mask = static_cast<unsigned>(_mm_movemask_epi8(v))) {
+      return i + static_cast<size_t>(__builtin_ctz(mask));
+    }
+  }
+#endif
+  for (; i < text.size(); ++i) {
+    if (static_cast<unsigned char>(text[i]) >= 0x80) return i;
+  }
+  return text.size();
+}
+
+}  // namespace
 
 std::optional<TextEncoding> ParseTextEncoding(std::string_view name) {
   std::string folded;
@@ -80,26 +126,30 @@ std::vector<std::string> DescribeUnstorable(const NarrowedText& text) {
 
 bool EncodingSink::Write(std::string_view bytes) {
   if (encoding_ == TextEncoding::kWindows1252) return target_.Write(bytes);
-  // Exports write many short pieces, mostly ASCII: those pass unchanged,
-  // and the others reuse one buffer rather than allocating each time.
-  static const std::array<std::string, 128> kHigh = [] {
-    std::array<std::string, 128> high;
-    for (int b = 0; b < 128; ++b) high[b] = Cp1252ToUtf8(std::string(1, static_cast<char>(b + 128)));
-    return high;
-  }();
-  size_t i = 0;
-  while (i < bytes.size() && static_cast<unsigned char>(bytes[i]) < 0x80) ++i;
+  size_t i = FirstHighByte(bytes, 0);
   if (i == bytes.size()) return target_.Write(bytes);
-  wide_.assign(bytes.substr(0, i));
-  for (; i < bytes.size(); ++i) {
-    const unsigned char c = static_cast<unsigned char>(bytes[i]);
-    if (c < 0x80) {
-      wide_.push_back(static_cast<char>(c));
-    } else {
-      wide_ += kHigh[c - 128];
+  // A byte widens to at most three; the buffer only ever grows, so that
+  // the many blocks of an export reuse it without clearing it each time.
+  if (wide_.size() < bytes.size() * 3) wide_.resize(bytes.size() * 3);
+  const auto& high = HighBytes();
+  char* out = wide_.data();
+  std::memcpy(out, bytes.data(), i);
+  out += i;
+  while (i < bytes.size()) {
+    const auto c = static_cast<unsigned char>(bytes[i]);
+    if (c >= 0x80) {
+      const WideByte& w = high[c - 0x80];
+      std::memcpy(out, w.bytes, sizeof w.bytes);
+      out += w.size;
+      ++i;
+      continue;
     }
+    const size_t next = FirstHighByte(bytes, i);
+    std::memcpy(out, bytes.data() + i, next - i);
+    out += next - i;
+    i = next;
   }
-  return target_.Write(wide_);
+  return target_.Write(std::string_view(wide_.data(), static_cast<size_t>(out - wide_.data())));
 }
 
 }  // namespace cx

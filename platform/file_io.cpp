@@ -21,6 +21,9 @@ namespace cx {
 namespace {
 
 constexpr size_t kWriteBuffer = 1 << 16;
+// How much of a file to be flushed is written before it is sent on to the
+// disk.
+constexpr uint64_t kWriteBackStep = uint64_t{4} << 20;
 
 std::string ErrnoText() { return std::strerror(errno); }
 
@@ -159,12 +162,25 @@ FileBuffer::~FileBuffer() {
   if (data_) ::munmap(data_, mapped_);
 }
 
-bool FileBuffer::Read(const std::string& path) {
+bool FileBuffer::Read(const std::string& path, Access access) {
   constexpr size_t kHugePage = 2u << 20;
   struct stat st{};
   int fd = OpenRegular(path, &st);
   if (fd < 0) return false;
   size_t want = static_cast<size_t>(st.st_size);
+  if (access == Access::kMap && want > 0) {
+    // All pages at once: one by one, each first touch would fault.
+    void* block = ::mmap(nullptr, want, PROT_READ, MAP_PRIVATE | MAP_POPULATE, fd, 0);
+    if (block != MAP_FAILED) {
+      ::close(fd);
+      if (data_) ::munmap(data_, mapped_);
+      data_ = static_cast<uint8_t*>(block);
+      size_ = want;
+      mapped_ = want;
+      state_ = StateOf(st);
+      return true;
+    }
+  }
   size_t mapped = (want + kHugePage - 1) / kHugePage * kHugePage;
   if (mapped == 0) mapped = kHugePage;
   void* block = ::mmap(nullptr, mapped, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
@@ -283,6 +299,7 @@ Status SafeFileWriter::Fail(const std::string& what) {
 
 Status SafeFileWriter::Open() {
   written_.reset();
+  writtenBytes_ = startedBytes_ = 0;
   if (!ResolveLinks(target_, real_)) return Fail("Cannot follow the link " + target_);
   const size_t slash = real_.rfind('/');
   const std::string folder = slash == std::string::npos ? "" : real_.substr(0, slash + 1);
@@ -321,6 +338,7 @@ Status SafeFileWriter::Open() {
     return Status::Error("Cannot write " + target_ + ": the file is read-only");
   }
 
+  replacing_ = exists;
   const std::string dir = DirectoryOf(real_);
   const std::string prefix = TemporaryPrefix(name, NameLimit(dir));
   RemoveDeadTemporaries(dir, prefix);
@@ -352,9 +370,18 @@ Status SafeFileWriter::Open() {
 }
 
 bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
+  // A file that will be flushed starts on its way to the disk while the
+  // rest is still being written, so that the flush at the end waits for
+  // the last part only. Only a start: the flush still decides. The same
+  // holds for one that replaces a file without a flush: renaming it over
+  // the old one makes the file system send all of it on its way then (lest
+  // a crash leave an empty file where the old one was), all at once at the
+  // end unless it was started on the way. A large block goes in steps.
+  const bool sendOn = (options_.sync || replacing_) && !direct_;
   size_t done = 0;
   while (done < size) {
-    ssize_t n = ::write(fd_, p + done, size - done);
+    const size_t step = sendOn ? std::min<size_t>(size - done, kWriteBackStep) : size - done;
+    ssize_t n = ::write(fd_, p + done, step);
     if (n < 0 && errno == EINTR) continue;
     if (n <= 0) {
       failed_ = true;
@@ -362,6 +389,14 @@ bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
       return false;
     }
     done += static_cast<size_t>(n);
+    writtenBytes_ += static_cast<uint64_t>(n);
+#if defined(__linux__)
+    if (sendOn && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
+      ::sync_file_range(fd_, static_cast<off64_t>(startedBytes_),
+                        static_cast<off64_t>(writtenBytes_ - startedBytes_), SYNC_FILE_RANGE_WRITE);
+      startedBytes_ = writtenBytes_;
+    }
+#endif
   }
   return true;
 }

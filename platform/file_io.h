@@ -40,13 +40,22 @@ int64_t ReadFileRange(const std::string& path, uint64_t offset, size_t length, u
 // their pages one by one costs more than reading them.
 class FileBuffer {
  public:
+  // kCopy reads the bytes into memory of the process's own. kMap maps the
+  // file's cached pages instead, which costs neither fresh memory nor a
+  // copy; but a program that rewrites the file in place while it is mapped
+  // changes these bytes too, and one that shortens it makes reading past
+  // its new end raise SIGBUS. Only for processes that live a moment and
+  // hold the file's lock (the command-line tool); an empty file, or one
+  // that cannot be mapped, is read as with kCopy.
+  enum class Access { kCopy, kMap };
+
   FileBuffer() = default;
   ~FileBuffer();
   FileBuffer(const FileBuffer&) = delete;
   FileBuffer& operator=(const FileBuffer&) = delete;
 
   // False when the file cannot be opened or read (the buffer is then empty).
-  bool Read(const std::string& path);
+  bool Read(const std::string& path, Access access = Access::kCopy);
   const uint8_t* data() const { return data_; }
   size_t size() const { return size_; }
   // The file's state when it was read.
@@ -122,10 +131,13 @@ class SafeFileWriter {
   std::string temp_;
   int fd_ = -1;
   bool direct_ = false;
+  bool replacing_ = false;  // a file of the target's name exists
   Options options_;
   bool failed_ = false;
   std::string error_;
   std::vector<uint8_t> buffer_;
+  uint64_t writtenBytes_ = 0;
+  uint64_t startedBytes_ = 0;  // sent on to the disk up to here
   std::optional<FileState> written_;
 };
 

@@ -212,6 +212,23 @@ TEST(NarrowText, KeepsWhatFitsAndCountsLinesAtLineFeeds) {
   for (size_t at = 0; at < all.size(); at += 7) sink.Write(std::string_view(all).substr(at, 7));
   EXPECT_EQ(wide.text, Cp1252ToUtf8(all));
   EXPECT_EQ(NarrowText(wide.text, TextEncoding::kUtf8).bytes, all);
+
+  // Long ASCII runs are skipped a block at a time: a wide byte at every
+  // place in a block, at the start and the end of a piece, and pieces
+  // larger than a block, must all come out the same.
+  std::string mixed;
+  for (int gap = 0; gap < 40; ++gap) {
+    mixed.append(static_cast<size_t>(gap), 'a');
+    mixed.push_back(static_cast<char>(0x80 + gap * 3));
+  }
+  for (size_t piece : {size_t{1}, size_t{15}, size_t{16}, size_t{17}, size_t{100}, mixed.size()}) {
+    StringSink pieces;
+    EncodingSink widening(pieces, TextEncoding::kUtf8);
+    for (size_t at = 0; at < mixed.size(); at += piece) {
+      widening.Write(std::string_view(mixed).substr(at, piece));
+    }
+    EXPECT_EQ(pieces.text, Cp1252ToUtf8(mixed)) << "pieces of " << piece;
+  }
 }
 
 }  // namespace

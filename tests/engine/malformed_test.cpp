@@ -238,5 +238,45 @@ TEST_F(MalformedFileTest, FewerThanThirtyOneRecords) {
   }
 }
 
+// The count at open walks several records side by side, each from its own
+// part of the file; whatever part a bad record falls in, and in the records
+// left over after the parts, it must agree with the records checked one by
+// one.
+TEST(CountMalformedTest, AgreesWithTheCheckOfEachRecord) {
+  const std::vector<ByteVector> kinds = {
+      {},                                      // no slots at all
+      SlotWriter().Text("ok").End().bytes,     // ends with the mark
+      SlotWriter().Text("ok").Number(7).bytes, // ends without a mark
+      {0, 0x10, 0x00, 'a', 'b'},               // a length past the end
+      {1, 2, 3, 4},                            // a prefix longer than the record
+      SlotWriter(true).Text("ext").End().bytes,
+      {0, 0x02, 0x00, 'x', 'y', 0x05},         // a length cut in half
+  };
+  RecordTable records;
+  size_t expected = 0;
+  for (size_t n = 0; n < 61; ++n) {
+    // Steps of 3 through 7 kinds give every lane every kind for some count.
+    const ByteVector& bytes = kinds[(n * 3) % kinds.size()];
+    records.emplace_back(bytes, 0, 0);
+    if (!RecordIsWellFormed(records.back().bytes())) ++expected;
+    EXPECT_EQ(CountMalformed(records), expected) << n + 1 << " records";
+  }
+  RecordTable full(30);
+  ByteVector all;
+  all.push_back(0);
+  for (int slot = 0; slot < format::kFieldCount; ++slot) all.insert(all.end(), {1, 0, 'v'});
+  all.insert(all.end(), {0x40, 0x00});  // past the last slot: never read
+  for (DataRecord& r : full) r = DataRecord(all, 0, 0);
+  EXPECT_EQ(CountMalformed(full), 0u);
+
+  // A large file is checked in two halves; bad records on either side of
+  // the middle and at both ends all count.
+  RecordTable large(20001, DataRecord(kinds[1], 0, 0));
+  for (size_t at : {size_t{0}, size_t{9999}, size_t{10000}, size_t{10001}, size_t{20000}}) {
+    large[at] = DataRecord(kinds[3], 0, 0);
+  }
+  EXPECT_EQ(CountMalformed(large), 5u);
+}
+
 }  // namespace
 }  // namespace cx

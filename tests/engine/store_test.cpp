@@ -102,6 +102,31 @@ TEST_F(StoreTest, SavingTwiceWithoutChangeDiffersOnlyInDateAndDirtyBit) {
   EXPECT_EQ(ReadBytes(db.path()), second);
 }
 
+// A mapped open leaves the records as views of the file's own pages. The
+// save replaces that file, so the views must still read the old file's
+// bytes while they are written out, and after: saving twice, and saving an
+// edited copy, gives what a copied open gives.
+TEST_F(StoreTest, MappedOpenSavesOverItsOwnFileAsACopiedOpenDoes) {
+  Database made = MakeFilled("mapped.PDB");
+  ASSERT_TRUE(made.Save(FixedClock(1000)).ok());
+  Database copied;
+  ASSERT_TRUE(copied.Open(made.path(), ui, FileBuffer::Access::kCopy).ok());
+  ASSERT_TRUE(copied.SaveAs(dir.File("copied.PDB"), FixedClock(3000)).ok());
+
+  Database mapped;
+  ASSERT_TRUE(mapped.Open(made.path(), ui, FileBuffer::Access::kMap).ok());
+  ASSERT_TRUE(mapped.Save(FixedClock(2000)).ok());
+  ASSERT_TRUE(mapped.Save(FixedClock(3000)).ok());
+  EXPECT_EQ(ReadBytes(made.path()), ReadBytes(dir.File("copied.PDB")));
+  EXPECT_EQ(ValueString(*FieldValue(mapped.record(1), 0)), "two");
+
+  mapped.ReplaceRecord(0, SlotWriter().Text("uno").End().bytes);
+  copied.ReplaceRecord(0, SlotWriter().Text("uno").End().bytes);
+  ASSERT_TRUE(mapped.Save(FixedClock(4000)).ok());
+  ASSERT_TRUE(copied.Save(FixedClock(4000)).ok());
+  EXPECT_EQ(ReadBytes(made.path()), ReadBytes(dir.File("copied.PDB")));
+}
+
 TEST_F(StoreTest, DirtyBitLeavesOtherAttributeBitsAlone) {
   auto records = testing::StandardRecords();
   records[0].attributes = 0x4A;
@@ -278,14 +303,15 @@ TEST_F(StoreTest, AddingStopsAtTheRecordLimit) {
 TEST_F(StoreTest, RecordsCopiedThroughAnArenaOutliveItAndEachOther) {
   Database db = Database::CreateNew(dir.File("arena.PDB"), "arena");
   db.schema() = testing::SchemaOf({FieldType::Unique, FieldType::Text});
-  constexpr int kRecords = 400;  // enough to fill blocks of several sizes
+  // About 4 MB of copies: blocks of every size, the largest in large pages.
+  constexpr int kRecords = 4000;
   for (int i = 0; i < kRecords; ++i) db.AppendRecord(SlotWriter().Number(i + 1).End().bytes);
   const uint32_t next = db.NextUniqueNumber();
   std::vector<ByteVector> expected(kRecords);
   {
     RecordArena arena;
     for (int i = 0; i < kRecords; ++i) {
-      expected[i] = SlotWriter().Number(i + 1).Text(std::string(i % 97 + 1, char('a' + i % 26))).End().bytes;
+      expected[i] = SlotWriter().Number(i + 1).Text(std::string(i * 37 % 2000 + 1, char('a' + i % 26))).End().bytes;
       db.ReplaceRecord(i, ByteView(expected[i]), arena);
     }
     // A number past the next one moves it on, as any replacement does.

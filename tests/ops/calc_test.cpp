@@ -130,6 +130,38 @@ TEST(CalcRecordTest, ARecordWithoutTheSlotGrowsIt) {
   EXPECT_EQ(t.TextAt(1, name), "keep me");
 }
 
+// A pass finds a record's slots once and moves them along as results
+// change size: results that grow and shrink ahead of other values, a value
+// that ran past the record's end, and a record that ends before the slots.
+TEST(CalcRecordTest, ResultsOfEverySizeLeaveTheOtherValuesInPlace) {
+  TestDb t;
+  const int qty = t.Field(FieldType::Integer, "Qty");
+  const int first = t.Calc("First", kAdd, k4Places, qty, kConst, 0, "", "1");
+  const int name = t.Field(FieldType::Text, "Name");
+  const int second = t.Calc("Second", kMul, k2Places, first, kConst, 0, "", "2");
+  const int note = t.Field(FieldType::Note, "Note");
+  t.Add({Num(qty, 4), Text(first, "x"), Text(name, "keep"), Text(second, "a much longer old text"),
+         Text(note, "tail")});
+  Bytes overrun = testing::RawRecord({testing::Le32(9)}, false);
+  overrun.insert(overrun.end(), {0x40, 0x00, '1', '2', '3'});
+  t.db.AppendRecord(overrun);
+  t.db.AppendRecord(testing::RawRecord({testing::Le32(7)}));
+  t.Add({Num(qty, 1000), Text(first, "1001.0000"), Text(name, "same"), Text(second, "0")});
+
+  ASSERT_EQ(RecalculateFrom(t.session, 0), 0);
+  EXPECT_EQ(t.TextAt(0, first), "5.0000");
+  EXPECT_EQ(t.TextAt(0, second), "10.00");
+  EXPECT_EQ(t.TextAt(0, name), "keep");
+  EXPECT_EQ(t.TextAt(0, note), "tail");
+  EXPECT_EQ(t.TextAt(1, first), "10.0000");
+  EXPECT_EQ(t.TextAt(1, second), "20.00");
+  EXPECT_EQ(t.TextAt(2, first), "8.0000");
+  EXPECT_EQ(t.TextAt(2, second), "16.00");
+  EXPECT_EQ(t.TextAt(3, second), "2002.00");
+  EXPECT_EQ(t.TextAt(3, name), "same");
+  for (size_t i = 0; i < t.db.recordCount(); ++i) EXPECT_TRUE(RecordIsWellFormed(t.db.record(i))) << i;
+}
+
 TEST(CalcPassTest, PrevRecordRunsThroughTheRecordsInView) {
   TestDb t;
   const int qty = t.Field(FieldType::Integer, "Qty");

@@ -11,6 +11,7 @@
 #include <unistd.h>
 
 #include <chrono>
+#include <cstring>
 #include <functional>
 #include <string>
 #include <thread>
@@ -292,6 +293,30 @@ TEST(ReadingTest, FifosAndDevicesAreRefusedAtOnce) {
   EXPECT_EQ(ReadFileRange("/dev/zero", 0, sizeof head, head), -1);
   EXPECT_FALSE(buffer.Read("/dev/zero"));
   ::alarm(0);
+}
+
+TEST(ReadingTest, AMappedReadHoldsWhatACopiedReadHolds) {
+  TempDir dir;
+  const std::string path = dir.File("Mapped.PDB");
+  std::string text;
+  for (int i = 0; i < 5000; ++i) text += std::to_string(i * 7919) + ",";
+  Put(path, text);
+  FileBuffer copied, mapped;
+  ASSERT_TRUE(copied.Read(path, FileBuffer::Access::kCopy));
+  ASSERT_TRUE(mapped.Read(path, FileBuffer::Access::kMap));
+  ASSERT_EQ(mapped.size(), text.size());
+  EXPECT_EQ(std::memcmp(mapped.data(), text.data(), text.size()), 0);
+  EXPECT_EQ(mapped.state(), copied.state());
+  // Reading again into the same buffer gives up the first mapping.
+  Put(path, "short");
+  ASSERT_TRUE(mapped.Read(path, FileBuffer::Access::kMap));
+  EXPECT_EQ(std::string(reinterpret_cast<const char*>(mapped.data()), mapped.size()), "short");
+
+  // An empty file cannot be mapped; it reads as empty all the same.
+  Put(path, "");
+  ASSERT_TRUE(mapped.Read(path, FileBuffer::Access::kMap));
+  EXPECT_EQ(mapped.size(), 0u);
+  EXPECT_FALSE(mapped.Read(dir.File("Missing.PDB"), FileBuffer::Access::kMap));
 }
 
 TEST(FileLockTest, OneHolderAtATime) {

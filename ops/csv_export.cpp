@@ -31,11 +31,14 @@ int SlotAt(const Schema& schema, int position, bool fieldNumberOrder) {
 }
 
 // Where `text` first holds a byte that makes a value need quotes (a double
-// quote, the separator, CR or LF), or npos. Export asks this of every value
-// and most hold none, so long ones are scanned 16 bytes at a time.
-size_t FirstSpecial(std::string_view text, char separator) {
-  auto special = [separator](char c) {
-    return c == csv::kQuote || c == separator || c == '\r' || c == '\n';
+// quote, the separator, CR or LF) or, with kStopAtZero, a zero byte (the end
+// of a stored value), or npos. Export asks this of every value and most
+// hold none, so long ones are scanned 16 bytes at a time. No load reaches
+// past the text's end: a stored value may end its file image.
+template <bool kStopAtZero>
+size_t FirstOf(std::string_view text, char separator) {
+  auto stop = [separator](char c) {
+    return (kStopAtZero && c == '\0') || c == csv::kQuote || c == separator || c == '\r' || c == '\n';
   };
   size_t i = 0;
 #if defined(__SSE2__)
@@ -46,8 +49,9 @@ size_t FirstSpecial(std::string_view text, char separator) {
     const __m128i lf = _mm_set1_epi8('\n');
     auto hits = [&](size_t at) {
       const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + at));
-      const __m128i any = _mm_or_si128(_mm_or_si128(_mm_cmpeq_epi8(v, quote), _mm_cmpeq_epi8(v, sep)),
-                                       _mm_or_si128(_mm_cmpeq_epi8(v, cr), _mm_cmpeq_epi8(v, lf)));
+      __m128i any = _mm_or_si128(_mm_or_si128(_mm_cmpeq_epi8(v, quote), _mm_cmpeq_epi8(v, sep)),
+                                 _mm_or_si128(_mm_cmpeq_epi8(v, cr), _mm_cmpeq_epi8(v, lf)));
+      if constexpr (kStopAtZero) any = _mm_or_si128(any, _mm_cmpeq_epi8(v, _mm_setzero_si128()));
       return static_cast<unsigned>(_mm_movemask_epi8(any));
     };
     for (; i + 16 <= text.size(); i += 16) {
@@ -62,49 +66,16 @@ size_t FirstSpecial(std::string_view text, char separator) {
   }
 #endif
   for (; i < text.size(); ++i) {
-    if (special(text[i])) return i;
-  }
-  return std::string_view::npos;
-}
-
-// Where a stored value first holds a zero byte (its end) or a byte that
-// would need quotes, or npos. One pass over the record's own bytes tells
-// whether the text can be copied out as it is.
-size_t FirstStop(std::string_view text, char separator) {
-  auto stop = [separator](char c) {
-    return c == '\0' || c == csv::kQuote || c == separator || c == '\r' || c == '\n';
-  };
-  size_t i = 0;
-#if defined(__SSE2__)
-  if (text.size() >= 16) {
-    const __m128i zero = _mm_setzero_si128();
-    const __m128i quote = _mm_set1_epi8(csv::kQuote);
-    const __m128i sep = _mm_set1_epi8(separator);
-    const __m128i cr = _mm_set1_epi8('\r');
-    const __m128i lf = _mm_set1_epi8('\n');
-    auto hits = [&](size_t at) {
-      const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text.data() + at));
-      const __m128i any = _mm_or_si128(
-          _mm_or_si128(_mm_cmpeq_epi8(v, zero), _mm_cmpeq_epi8(v, quote)),
-          _mm_or_si128(_mm_cmpeq_epi8(v, sep), _mm_or_si128(_mm_cmpeq_epi8(v, cr), _mm_cmpeq_epi8(v, lf))));
-      return static_cast<unsigned>(_mm_movemask_epi8(any));
-    };
-    for (; i + 16 <= text.size(); i += 16) {
-      if (unsigned mask = hits(i)) return i + static_cast<size_t>(__builtin_ctz(mask));
-    }
-    // Never a load past the value's end: the value may end its file image.
-    if (i < text.size()) {
-      const size_t at = text.size() - 16;
-      if (unsigned mask = hits(at)) return at + static_cast<size_t>(__builtin_ctz(mask));
-    }
-    return std::string_view::npos;
-  }
-#endif
-  for (; i < text.size(); ++i) {
     if (stop(text[i])) return i;
   }
   return std::string_view::npos;
 }
+
+size_t FirstSpecial(std::string_view text, char separator) { return FirstOf<false>(text, separator); }
+
+// One pass over the record's own bytes tells whether the text can be copied
+// out as it is.
+size_t FirstStop(std::string_view text, char separator) { return FirstOf<true>(text, separator); }
 
 constexpr size_t kWriteBlock = size_t{1} << 16;
 

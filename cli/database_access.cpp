@@ -35,7 +35,7 @@ std::string LocateDatabase(const std::string& path) {
   return path;
 }
 
-bool LockDatabases(Context& ctx, const std::vector<std::string>& paths) {
+bool LockDatabases(Context& ctx, const std::vector<std::string>& paths, FileLock::Kind kind) {
   std::vector<std::pair<FileState, std::string>> wanted;
   for (const std::string& path : paths) {
     std::optional<FileState> state = StatFile(path);
@@ -52,7 +52,7 @@ bool LockDatabases(Context& ctx, const std::vector<std::string>& paths) {
   });
   for (const auto& w : wanted) {
     auto lock = std::make_unique<FileLock>();
-    if (Status s = lock->Acquire(w.second, kLockWaitMs); !s) {
+    if (Status s = lock->Acquire(w.second, kLockWaitMs, kind); !s) {
       Failure(ctx, s.message());
       return false;
     }
@@ -66,14 +66,31 @@ bool OpenForCommand(Context& ctx, const std::string& path, Database& db) {
   return OpenForCommand(ctx, path, session);
 }
 
-bool OpenForCommand(Context& ctx, const std::string& given, DataSession& session) {
+namespace {
+
+bool OpenLocked(Context& ctx, const std::string& given, DataSession& session, FileLock::Kind kind) {
   const std::string path = LocateDatabase(given);
-  if (!LockDatabases(ctx, {path})) return false;
+  if (!LockDatabases(ctx, {path}, kind)) return false;
   if (!CheckOpenAccess(path, ctx.ui)) return false;
   // The command ends within moments and holds the file's lock meanwhile, so
   // the file's own cached pages can serve as its image; main() turns the
   // fault of a file cut short by another program into an error.
   return OpenDatabase(session, path, FileBuffer::Access::kMap).ok();
+}
+
+}  // namespace
+
+bool OpenForCommand(Context& ctx, const std::string& given, DataSession& session) {
+  return OpenLocked(ctx, given, session, FileLock::Kind::kExclusive);
+}
+
+bool OpenForReading(Context& ctx, const std::string& path, Database& db) {
+  DataSession session(db, ctx.locale, ctx.ui);
+  return OpenForReading(ctx, path, session);
+}
+
+bool OpenForReading(Context& ctx, const std::string& given, DataSession& session) {
+  return OpenLocked(ctx, given, session, FileLock::Kind::kShared);
 }
 
 bool OpenHeadForCommand(Context& ctx, const std::string& given, DatabaseHead& head) {

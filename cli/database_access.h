@@ -21,7 +21,10 @@ std::string LocateDatabase(const std::string& path);
 // Locks the databases at `paths` for the rest of the command, waiting a
 // while for another command that holds one. False after printing the
 // message when one stays busy. Files that do not exist are not locked.
-bool LockDatabases(Context& ctx, const std::vector<std::string>& paths);
+// Commands that only read take shared locks, so that two exports of one
+// file run side by side, while a command that changes it waits for them.
+bool LockDatabases(Context& ctx, const std::vector<std::string>& paths,
+                   FileLock::Kind kind = FileLock::Kind::kExclusive);
 
 // Opens `path` into `db` as the program does (after locking it): the "Open Database" access
 // check (asking for --password where the file requires it), the open with
@@ -31,6 +34,12 @@ bool OpenForCommand(Context& ctx, const std::string& path, Database& db);
 // The same into a session made with ctx's locale and port, for commands
 // that go on working in it (its view list and run-time state are kept).
 bool OpenForCommand(Context& ctx, const std::string& path, DataSession& session);
+
+// The same for commands that never save the file: it is shared with other
+// readers. The open's own follow-up work (a re-sort the file still owes)
+// then stays in memory.
+bool OpenForReading(Context& ctx, const std::string& path, Database& db);
+bool OpenForReading(Context& ctx, const std::string& path, DataSession& session);
 
 // For commands that only show what a file holds before its records: the
 // same access check, then the header, schema and popup lists alone, so

@@ -470,7 +470,7 @@ void SafeFileWriter::Abandon() {
   }
 }
 
-Status FileLock::Acquire(const std::string& path, int timeoutMs) {
+Status FileLock::Acquire(const std::string& path, int timeoutMs, Kind kind) {
   Release();
   const auto deadline = std::chrono::steady_clock::now() + std::chrono::milliseconds(timeoutMs);
   auto pause = std::chrono::milliseconds(1);
@@ -478,7 +478,7 @@ Status FileLock::Acquire(const std::string& path, int timeoutMs) {
     struct stat opened{};
     int fd = OpenRegular(path, &opened);
     if (fd < 0) return Status::Ok();
-    if (::flock(fd, LOCK_EX | LOCK_NB) == 0) {
+    if (::flock(fd, (kind == Kind::kShared ? LOCK_SH : LOCK_EX) | LOCK_NB) == 0) {
       // The holder before may have saved while this process waited, putting
       // a new file in place of the one locked here: then that one counts.
       struct stat now{};

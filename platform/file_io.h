@@ -156,10 +156,13 @@ class FileLock {
   FileLock(const FileLock&) = delete;
   FileLock& operator=(const FileLock&) = delete;
 
+  // Readers share a file; one that changes it holds it alone.
+  enum class Kind { kExclusive, kShared };
+
   // Waits up to `timeoutMs` for the lock on the regular file `path` leads
   // to. A name that does not exist or is not a regular file is not locked
   // and not an error (held() then tells): there is nothing to protect yet.
-  Status Acquire(const std::string& path, int timeoutMs);
+  Status Acquire(const std::string& path, int timeoutMs, Kind kind = Kind::kExclusive);
   void Release();
   bool held() const { return fd_ >= 0; }
   // The locked file (device and inode), to recognise a second name of it.

@@ -38,7 +38,7 @@ class BeamCommand : public Command {
     }
     const std::string path = args.positional()[0];
     Database db;
-    if (!OpenForCommand(ctx, path, db)) return kExitFailed;
+    if (!OpenForReading(ctx, path, db)) return kExitFailed;
     if (!Allowed(CheckAccess(db, secured::kBeamData, ctx.ui))) return kExitFailed;
 
     obex::BeamWhat what = obex::BeamWhat::kDatabase;

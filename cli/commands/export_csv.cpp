@@ -39,7 +39,7 @@ class ExportCsvCommand : public Command {
     const std::string& out = args.positional()[1];
     if (out != "-" && !TextTargetAllowed(ctx, args, out, args.positional()[0])) return kExitFailed;
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    if (!OpenForReading(ctx, args.positional()[0], db)) return kExitFailed;
     CsvExportOptions options;
     options.quoteAll = args.has("--quote-all");
     options.withHeader = args.has("--header");

@@ -301,7 +301,7 @@ class ExportSqliteCommand : public Command {
         return Failure(ctx, s.message() + " (--force writes it anyway)");
       }
     }
-    if (!LockDatabases(ctx, files)) return kExitFailed;
+    if (!LockDatabases(ctx, files, FileLock::Kind::kShared)) return kExitFailed;
 
     std::vector<Table> tables;
     std::set<std::string> taken = {"cardovexschema", "cardovexpopups"};
@@ -309,7 +309,7 @@ class ExportSqliteCommand : public Command {
       Table t;
       t.path = path;
       t.db = std::make_unique<Database>();
-      if (!OpenForCommand(ctx, path, *t.db)) return kExitFailed;
+      if (!OpenForReading(ctx, path, *t.db)) return kExitFailed;
       std::string wanted = Cp1252ToUtf8(t.db->Name());
       if (wanted.empty()) wanted = FileStem(path);
       // SQLite keeps names beginning "sqlite_" for itself.

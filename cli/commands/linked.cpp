@@ -33,7 +33,7 @@ class LinkedCommand : public Command {
 
   int Run(Context& ctx, const Arguments& args) override {
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    if (!OpenForReading(ctx, args.positional()[0], db)) return kExitFailed;
     auto record = ParseNumber(args.positional()[1]);
     if (!record || *record < 0 || static_cast<size_t>(*record) >= db.recordCount()) {
       return UsageError(ctx, *this, "RECORD must be a record index below " +

@@ -39,7 +39,7 @@ class ListingCommand : public Command {
       return kExitFailed;
     }
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    if (!OpenForReading(ctx, args.positional()[0], db)) return kExitFailed;
     std::optional<size_t> record;
     if (std::string error; !RecordOption(args, db, record, error)) return UsageError(ctx, *this, error);
     const bool all = !record;

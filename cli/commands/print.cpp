@@ -34,7 +34,7 @@ class PrintCommand : public Command {
   int Run(Context& ctx, const Arguments& args) override {
     if (int code = RefuseJson(ctx, *this)) return code;
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    if (!OpenForReading(ctx, args.positional()[0], db)) return kExitFailed;
     std::optional<size_t> record;
     if (std::string error; !RecordOption(args, db, record, error)) return UsageError(ctx, *this, error);
     const bool all = !record;

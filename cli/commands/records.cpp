@@ -51,7 +51,7 @@ class RecordsCommand : public Command {
     }
     Database db;
     DataSession session(db, ctx.locale, ctx.ui);
-    if (!OpenForCommand(ctx, args.positional()[0], session)) return kExitFailed;
+    if (!OpenForReading(ctx, args.positional()[0], session)) return kExitFailed;
 
     std::vector<size_t> rows;
     std::optional<size_t> record;

@@ -46,7 +46,7 @@ class ReportCommand : public Command {
       return kExitFailed;
     }
     Database db;
-    if (!OpenForCommand(ctx, args.positional()[0], db)) return kExitFailed;
+    if (!OpenForReading(ctx, args.positional()[0], db)) return kExitFailed;
     const int slot = ResolveField(db, args.positional()[1]);
     if (slot < 0) return UsageError(ctx, *this, "no field " + args.positional()[1]);
     LocaleInfo locale = ctx.locale;

@@ -164,6 +164,26 @@ TEST(Concurrency, TwentyImportsAtOnceAllArrive) {
   EXPECT_EQ(RecordCount(db), static_cast<size_t>(kProcesses));
 }
 
+TEST(Concurrency, ReadersShareAFileThatAWriterHolds) {
+  TempDir dir;
+  const std::string db = MakeDatabase(dir.File("Read.PDB"), 2);
+  // Another reader (here the test) does not hold up queries and exports...
+  FileLock reading;
+  ASSERT_TRUE(reading.Acquire(db, 1000, FileLock::Kind::kShared).ok());
+  Result records = RunProgram(dir, {"records", db}, "", 10);
+  EXPECT_EQ(records.code, 0) << records.err;
+  EXPECT_EQ(RunProgram(dir, {"export-csv", db, dir.File("out.csv")}, "", 10).code, 0);
+  // ...but a change waits until the reader is done.
+  pid_t add = Spawn({"add", db, "0=late"}, "/dev/null", dir.File("add.err"));
+  EXPECT_EQ(Await(add, std::chrono::steady_clock::now() + std::chrono::milliseconds(300)), -1);
+  reading.Release();
+  EXPECT_EQ(RecordCount(db), 2u);
+  add = Spawn({"add", db, "0=late"}, "/dev/null", dir.File("add.err"));
+  EXPECT_EQ(Await(add, std::chrono::steady_clock::now() + std::chrono::seconds(20)), 0)
+      << ReadText(dir.File("add.err"));
+  EXPECT_EQ(RecordCount(db), 3u);
+}
+
 TEST(Concurrency, SaveOverAFileChangedSinceOpeningIsRefused) {
   // A program that does not take the lock (here the test itself) still
   // never overwrites what a command saved in the meantime.

@@ -333,6 +333,17 @@ TEST(FileLockTest, OneHolderAtATime) {
   EXPECT_TRUE(second.Acquire(path, 1000).ok());
   EXPECT_TRUE(second.held());
 
+  // Readers share the file with each other, never with a writer.
+  second.Release();
+  FileLock reader1, reader2, writer;
+  ASSERT_TRUE(reader1.Acquire(path, 1000, FileLock::Kind::kShared).ok());
+  EXPECT_TRUE(reader2.Acquire(path, 50, FileLock::Kind::kShared).ok());
+  EXPECT_FALSE(writer.Acquire(path, 50).ok());
+  reader1.Release();
+  reader2.Release();
+  ASSERT_TRUE(writer.Acquire(path, 1000).ok());
+  EXPECT_FALSE(reader1.Acquire(path, 50, FileLock::Kind::kShared).ok());
+
   // Nothing to lock is no error.
   FileLock none;
   EXPECT_TRUE(none.Acquire(dir.File("Missing.PDB"), 50).ok());

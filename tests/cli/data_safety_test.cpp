@@ -20,6 +20,7 @@
 #include "cli/global_options.h"
 #include "engine/record_store.h"
 #include "platform/file_io.h"
+#include "tests/cli/program_run.h"
 #include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
@@ -29,15 +30,6 @@ namespace {
 using testing::TempDir;
 
 Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
-
-std::string ReadText(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  return std::string(std::istreambuf_iterator<char>(in), {});
-}
-
-void WriteText(const std::string& path, const std::string& text) {
-  std::ofstream(path, std::ios::binary) << text;
-}
 
 Bytes FileBytes(const std::string& path) {
   Bytes b;
@@ -65,36 +57,6 @@ std::string MakeDatabase(const std::string& path, int records) {
     ::unlink((path + ".csv").c_str());
   }
   return path;
-}
-
-// The real program in a child process with standard output going to
-// `stdoutPath`, ended after `seconds` at the latest.
-pid_t Spawn(const std::vector<std::string>& args, const std::string& stdoutPath,
-            const std::string& stderrPath) {
-  pid_t pid = ::fork();
-  if (pid != 0) return pid;
-  int out = ::open(stdoutPath.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-  int err = ::open(stderrPath.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-  if (out < 0 || err < 0) ::_exit(126);
-  ::dup2(out, STDOUT_FILENO);
-  ::dup2(err, STDERR_FILENO);
-  std::vector<char*> argv{const_cast<char*>(CARDOVEX_CLI)};
-  for (const std::string& a : args) argv.push_back(const_cast<char*>(a.c_str()));
-  argv.push_back(nullptr);
-  ::execv(CARDOVEX_CLI, argv.data());
-  ::_exit(127);
-}
-
-// Waits for `pid` until `deadline`; the exit code, or -1 (killed) when late.
-int Await(pid_t pid, std::chrono::steady_clock::time_point deadline) {
-  int status = 0;
-  while (std::chrono::steady_clock::now() < deadline) {
-    if (::waitpid(pid, &status, WNOHANG) == pid) return WIFEXITED(status) ? WEXITSTATUS(status) : -2;
-    std::this_thread::sleep_for(std::chrono::milliseconds(5));
-  }
-  ::kill(pid, SIGKILL);
-  ::waitpid(pid, &status, 0);
-  return -1;
 }
 
 Result RunProgram(const TempDir& dir, const std::vector<std::string>& args,

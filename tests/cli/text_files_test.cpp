@@ -19,6 +19,7 @@
 #include "ops/report.h"
 #include "ops/text_encoding.h"
 #include "platform/text_codec.h"
+#include "tests/cli/program_run.h"
 #include "tests/cli/run_in_process.h"
 #include "tests/support/test_support.h"
 
@@ -29,48 +30,13 @@ using testing::TempDir;
 
 Result Cli(std::vector<std::string> args) { return RunInProcess(std::move(args)); }
 
-std::string Slurp(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
-}
-
-void Spill(const std::string& path, const std::string& bytes) {
-  std::ofstream(path, std::ios::binary) << bytes;
-}
-
 // The program itself, its standard input read from `stdinPath`, given 20
 // seconds at most.
 Result RunProgram(const TempDir& dir, const std::vector<std::string>& args, const std::string& stdinPath) {
   const std::string outPath = dir.File("stdout.bin"), errPath = dir.File("stderr.txt");
-  pid_t pid = ::fork();
-  if (pid == 0) {
-    int in = ::open(stdinPath.c_str(), O_RDONLY);
-    int out = ::open(outPath.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-    int err = ::open(errPath.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-    if (in < 0 || out < 0 || err < 0) ::_exit(126);
-    ::dup2(in, STDIN_FILENO);
-    ::dup2(out, STDOUT_FILENO);
-    ::dup2(err, STDERR_FILENO);
-    std::vector<char*> argv{const_cast<char*>(CARDOVEX_CLI)};
-    for (const std::string& a : args) argv.push_back(const_cast<char*>(a.c_str()));
-    argv.push_back(nullptr);
-    ::execv(CARDOVEX_CLI, argv.data());
-    ::_exit(127);
-  }
-  int status = 0, code = -1;
-  const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(20);
-  while (std::chrono::steady_clock::now() < deadline) {
-    if (::waitpid(pid, &status, WNOHANG) == pid) {
-      code = WIFEXITED(status) ? WEXITSTATUS(status) : -2;
-      break;
-    }
-    std::this_thread::sleep_for(std::chrono::milliseconds(5));
-  }
-  if (code == -1) {
-    ::kill(pid, SIGKILL);
-    ::waitpid(pid, &status, 0);
-  }
-  return {code, Slurp(outPath), Slurp(errPath)};
+  const pid_t pid = Spawn(args, outPath, errPath, stdinPath);
+  const int code = Await(pid, std::chrono::steady_clock::now() + std::chrono::seconds(20));
+  return {code, ReadText(outPath), ReadText(errPath)};
 }
 
 std::string MakePeople(const TempDir& dir) {
@@ -92,7 +58,7 @@ TEST(CliTextFiles, Utf8CsvWithHeaderRoundTripsUnchanged) {
   TempDir dir;
   const std::string db = MakePeople(dir);
   // Editors on some systems begin the file with a byte-order mark.
-  Spill(dir.File("in.csv"), "\xEF\xBB\xBF" + kPeopleCsv);
+  WriteText(dir.File("in.csv"), "\xEF\xBB\xBF" + kPeopleCsv);
   Result r = Cli({"import-csv", db, dir.File("in.csv"), "--header"});
   ASSERT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(r.out, "3 records imported\n");
@@ -100,7 +66,7 @@ TEST(CliTextFiles, Utf8CsvWithHeaderRoundTripsUnchanged) {
 
   r = Cli({"export-csv", db, dir.File("out.csv"), "--header"});
   ASSERT_EQ(r.code, 0) << r.err;
-  EXPECT_EQ(Slurp(dir.File("out.csv")), kPeopleCsv);
+  EXPECT_EQ(ReadText(dir.File("out.csv")), kPeopleCsv);
   r = Cli({"export-csv", db, "-", "--header"});
   EXPECT_EQ(r.out, kPeopleCsv);
 
@@ -112,31 +78,31 @@ TEST(CliTextFiles, Utf8CsvWithHeaderRoundTripsUnchanged) {
 TEST(CliTextFiles, CharactersADatabaseCannotHoldAreNamedByLineAndNothingIsStored) {
   TempDir dir;
   const std::string db = MakePeople(dir);
-  const std::string before = Slurp(db);
+  const std::string before = ReadText(db);
   // A header, an ordinary line, a snowman on line 3, a stray byte on line 5
   // (after a quoted value spanning two lines).
-  Spill(dir.File("in.csv"),
+  WriteText(dir.File("in.csv"),
         "Name,Age,City\nAnn,1,Rome\nSnow \xE2\x98\x83 man,2,Oslo\n\"two\nlines\",3,x\nbad \xFF,4,y\n");
   Result r = Cli({"import-csv", db, dir.File("in.csv"), "--header"});
   EXPECT_EQ(r.code, 1);
   EXPECT_NE(r.err.find("2 lines hold"), std::string::npos) << r.err;
   EXPECT_NE(r.err.find("line 3: \"\xE2\x98\x83\""), std::string::npos) << r.err;
   EXPECT_NE(r.err.find("line 6: \"\\xFF\""), std::string::npos) << r.err;
-  EXPECT_EQ(Slurp(db), before);
+  EXPECT_EQ(ReadText(db), before);
 
   // Lines with values not stored as given count the header line too, so
   // that the numbers match what an editor shows.
-  Spill(dir.File("late.csv"), "Name,Age,City\nAnn,1,Rome\nBob,many,Oslo\n");
+  WriteText(dir.File("late.csv"), "Name,Age,City\nAnn,1,Rome\nBob,many,Oslo\n");
   r = Cli({"import-csv", db, dir.File("late.csv"), "--header", "--strict"});
   EXPECT_EQ(r.code, 1);
   EXPECT_NE(r.err.find("line 3"), std::string::npos) << r.err;
-  EXPECT_EQ(Slurp(db), before);
+  EXPECT_EQ(ReadText(db), before);
 }
 
 TEST(CliTextFiles, Windows1252GivesTheStoredBytesAndUtf8TheirWidening) {
   TempDir dir;
   const std::string db = MakePeople(dir);
-  Spill(dir.File("in.csv"), "Ren\xE9" ",40,Z\xFCrich\n\x80uro,2,\x84quoted\x93\n");
+  WriteText(dir.File("in.csv"), "Ren\xE9" ",40,Z\xFCrich\n\x80uro,2,\x84quoted\x93\n");
   Result r = Cli({"import-csv", db, dir.File("in.csv"), "--encoding", "windows-1252"});
   ASSERT_EQ(r.code, 0) << r.err;
 
@@ -148,16 +114,16 @@ TEST(CliTextFiles, Windows1252GivesTheStoredBytesAndUtf8TheirWidening) {
   // Made by the operations the desktop uses for its own exports.
   StringSink csv, listing;
   ASSERT_EQ(ExportCsvTo(opened, CsvExportOptions{}, csv, CsvSettings{}, locale, ui), 1);
-  EXPECT_EQ(Slurp(dir.File("a.csv")), csv.text);
-  EXPECT_EQ(Slurp(dir.File("a.csv")), Slurp(dir.File("in.csv")));
+  EXPECT_EQ(ReadText(dir.File("a.csv")), csv.text);
+  EXPECT_EQ(ReadText(dir.File("a.csv")), ReadText(dir.File("in.csv")));
   ASSERT_EQ(Cli({"export-csv", db, dir.File("u.csv")}).code, 0);
-  EXPECT_EQ(Slurp(dir.File("u.csv")), Cp1252ToUtf8(csv.text));
+  EXPECT_EQ(ReadText(dir.File("u.csv")), Cp1252ToUtf8(csv.text));
 
   WriteListing(opened, true, 0, listing, ListingContext{locale, nullptr});
   ASSERT_EQ(Cli({"listing", db, "-o", dir.File("l.txt"), "--encoding", "cp1252"}).code, 0);
-  EXPECT_EQ(Slurp(dir.File("l.txt")), listing.text);
+  EXPECT_EQ(ReadText(dir.File("l.txt")), listing.text);
   ASSERT_EQ(Cli({"listing", db, "-o", dir.File("lu.txt")}).code, 0);
-  EXPECT_EQ(Slurp(dir.File("lu.txt")), Cp1252ToUtf8(listing.text));
+  EXPECT_EQ(ReadText(dir.File("lu.txt")), Cp1252ToUtf8(listing.text));
   EXPECT_EQ(Cli({"listing", db}).out, Cp1252ToUtf8(listing.text));
 
   EXPECT_EQ(Cli({"report", db, "Age", "-o", dir.File("r.txt"), "--encoding", "latin-9"}).code, 2);
@@ -167,18 +133,18 @@ TEST(CliTextFiles, Windows1252GivesTheStoredBytesAndUtf8TheirWidening) {
 TEST(CliTextFiles, DashIsStandardInputAndOutputOfTheProgram) {
   TempDir dir;
   const std::string db = MakePeople(dir);
-  Spill(dir.File("in.csv"), kPeopleCsv);
+  WriteText(dir.File("in.csv"), kPeopleCsv);
   Result r = RunProgram(dir, {"import-csv", db, "-", "--header"}, dir.File("in.csv"));
   ASSERT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(r.out, "3 records imported\n");
 
-  Spill(dir.File("empty"), "");
+  WriteText(dir.File("empty"), "");
   r = RunProgram(dir, {"export-csv", db, "-", "--encoding", "windows-1252"}, dir.File("empty"));
   ASSERT_EQ(r.code, 0) << r.err;
   EXPECT_EQ(r.out, Utf8ToCp1252(kPeopleCsv.substr(kPeopleCsv.find('\n') + 1)));
 
   // An unstorable character from standard input names it as such.
-  Spill(dir.File("bad.csv"), "A \xE2\x82\xAC and \xE2\x84\xA2 fine,1,x\n\xE2\x88\x9E,2,y\n");
+  WriteText(dir.File("bad.csv"), "A \xE2\x82\xAC and \xE2\x84\xA2 fine,1,x\n\xE2\x88\x9E,2,y\n");
   r = RunProgram(dir, {"import-csv", db, "-"}, dir.File("bad.csv"));
   EXPECT_EQ(r.code, 1);
   EXPECT_NE(r.err.find("line 2: \"\xE2\x88\x9E\""), std::string::npos) << r.err;

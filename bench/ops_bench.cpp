@@ -127,9 +127,9 @@ Database AdversarialDatabase(long n) {
   return db;
 }
 
+// Sorts the records of `db` again and again from their first order.
 template <typename Sort>
-void RunAdversarialSort(benchmark::State& state, Sort sort) {
-  Database db = AdversarialDatabase(state.range(0));
+void TimeSorts(benchmark::State& state, Database db, Sort sort) {
   const RecordTable unsorted = db.table();
   for (auto _ : state) {
     state.PauseTiming();
@@ -138,6 +138,12 @@ void RunAdversarialSort(benchmark::State& state, Sort sort) {
     sort(db);
   }
   state.SetItemsProcessed(state.iterations() * state.range(0));
+  state.SetComplexityN(state.range(0));
+}
+
+template <typename Sort>
+void RunAdversarialSort(benchmark::State& state, Sort sort) {
+  TimeSorts(state, AdversarialDatabase(state.range(0)), sort);
 }
 
 void BM_SortAllAdversarial(benchmark::State& state) {
@@ -150,15 +156,7 @@ template <typename Sort>
 void RunSort(benchmark::State& state, Sort sort) {
   Database db = Generated(static_cast<size_t>(state.range(0)));
   ThreeKeys(db);
-  const RecordTable unsorted = db.table();
-  for (auto _ : state) {
-    state.PauseTiming();
-    db.table() = unsorted;
-    state.ResumeTiming();
-    sort(db);
-  }
-  state.SetItemsProcessed(state.iterations() * state.range(0));
-  state.SetComplexityN(state.range(0));
+  TimeSorts(state, std::move(db), sort);
 }
 
 void BM_SortAll(benchmark::State& state) {

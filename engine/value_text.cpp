@@ -216,6 +216,8 @@ std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot) {
 
 namespace {
 
+// The types and result formats whose text is the stored bytes up to their
+// zero (kept in step with the switch of AppendValueText).
 bool ShowsStored(const FieldDef& field) {
   switch (field.type()) {
     case FieldType::Text:
@@ -248,10 +250,6 @@ void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteV
     const void* nul = v.empty() ? nullptr : std::memchr(p, 0, v.size());
     out.append(p, nul ? static_cast<const char*>(nul) - p : v.size());
   };
-  if (ShowsStored(field)) {
-    appendStored(*value);
-    return;
-  }
   auto appendDate = [&](uint32_t dayNumber) {
     if (date) {
       AppendDate(dayNumber, *date, out);
@@ -268,7 +266,8 @@ void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteV
     case FieldType::Float:
     case FieldType::Note:
     case FieldType::DBPopup:
-      return;  // shown as stored, above
+      appendStored(*value);
+      return;
     case FieldType::Integer:
     case FieldType::Unique:
     case FieldType::Link:
@@ -299,6 +298,9 @@ void AppendValueText(const ValueContext& ctx, int fieldSlot, std::optional<ByteV
     }
     case FieldType::Calculated: {
       switch (field.resultFormat()) {
+        case 0: case 1: case 4: case 5: case 6:
+          appendStored(*value);
+          return;
         case 2:
         case 3: {
           const std::string stored = ValueString(*value);

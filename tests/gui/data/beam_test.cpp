@@ -68,6 +68,21 @@ class LoopbackReceiver {
   std::thread thread_;
 };
 
+// Beams `record` to `address` from a thread of its own: the receiver hands
+// each object to this (the GUI) thread, which must keep turning meanwhile.
+void SendAside(const std::string& address, const obex::BeamObject& record) {
+  std::atomic<bool> done{false};
+  std::thread sender([&] {
+    SilentUi quiet;
+    TcpTransport transport({address});
+    obex::BeamWindows none;
+    obex::BeamObjects({record}, transport, quiet, none, obex::BeamOptions{});
+    done = true;
+  });
+  QTRY_VERIFY_WITH_TIMEOUT(done.load(), 20000);
+  sender.join();
+}
+
 }  // namespace
 
 class BeamTest : public QObject {
@@ -150,20 +165,7 @@ class BeamTest : public QObject {
     QTRY_VERIFY_WITH_TIMEOUT(!window.listeningAddress().isEmpty(), 5000);
     const std::string address = window.listeningAddress().toStdString();
 
-    // Sends from a thread of its own: the receiver hands each object to
-    // this (the GUI) thread, which must keep turning meanwhile.
-    auto send = [&] {
-      std::atomic<bool> done{false};
-      std::thread sender([&] {
-        SilentUi quiet;
-        TcpTransport transport({address});
-        obex::BeamWindows none;
-        obex::BeamObjects({record}, transport, quiet, none, obex::BeamOptions{});
-        done = true;
-      });
-      QTRY_VERIFY_WITH_TIMEOUT(done.load(), 20000);
-      sender.join();
-    };
+    auto send = [&] { SendAside(address, record); };
 
     auto level = [&](int l) {
       SecuritySettings s = LoadSecuritySettings(db.schema());
@@ -225,18 +227,7 @@ class BeamTest : public QObject {
     QVERIFY(window.StartListening());
     QTRY_VERIFY_WITH_TIMEOUT(!window.listeningAddress().isEmpty(), 5000);
     const std::string address = window.listeningAddress().toStdString();
-    auto send = [&] {
-      std::atomic<bool> done{false};
-      std::thread sender([&] {
-        SilentUi quiet;
-        TcpTransport transport({address});
-        obex::BeamWindows none;
-        obex::BeamObjects({record}, transport, quiet, none, obex::BeamOptions{});
-        done = true;
-      });
-      QTRY_VERIFY_WITH_TIMEOUT(done.load(), 20000);
-      sender.join();
-    };
+    auto send = [&] { SendAside(address, record); };
 
     ui.yesNoAnswers = {true, true, true};
     send();  // the password prompt cancelled

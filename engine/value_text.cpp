@@ -1,7 +1,9 @@
 #include "engine/value_text.h"
 
+#include <algorithm>
 #include <cctype>
 #include <charconv>
+#include <cmath>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -175,13 +177,51 @@ std::string SecondsText(long seconds) {
   return buf;
 }
 
+namespace {
+
+// The "%.Nf" digits of `value` worked out in integers, for up to four
+// places: scaled by 10^N below 2^42 the product is within 2^-11 of the
+// exact one, so unless it lies that close to halfway between two integers
+// it rounds as the exact binary value does. False leaves the value to the
+// general conversion (ties, large numbers, NaN).
+bool FixedFromInteger(double value, int places, char* buf, char*& end) {
+  static constexpr double kScale[] = {1, 10, 100, 1000, 10000};
+  if (places < 0 || places > 4) return false;
+  const double scaled = value * kScale[places];
+  if (!(std::fabs(scaled) < 0x1p42)) return false;
+  const double whole = std::nearbyint(scaled);
+  if (std::fabs(scaled - whole) > 0.499) return false;
+  // Room in front for the zeros that make 0.05 read "0.05".
+  char digits[32];
+  char* first = digits + 4;
+  char* last = std::to_chars(first, digits + sizeof digits, static_cast<uint64_t>(std::fabs(whole))).ptr;
+  while (last - first <= places) *--first = '0';
+  char* out = buf;
+  // A negative value keeps its sign even when it rounds to zero, as printf.
+  if (std::signbit(value)) *out++ = '-';
+  char* point = last - places;
+  out = std::copy(first, point, out);
+  if (places > 0) {
+    *out++ = '.';
+    out = std::copy(point, last, out);
+  }
+  end = out;
+  return true;
+}
+
+}  // namespace
+
 std::string DecimalText(double value, int places, const LocaleInfo& locale) {
   // What "%12.Nf" prints, without its leading blanks: the exact decimal
-  // value rounded to N places. to_chars gives the same digits, much faster.
+  // value rounded to N places. to_chars gives the same digits, much faster,
+  // and most values need not even that.
   char buf[512];
   std::string out;
-  auto r = std::to_chars(buf, buf + sizeof buf, value, std::chars_format::fixed, places);
-  if (r.ec == std::errc()) {
+  char* end = nullptr;
+  if (FixedFromInteger(value, places, buf, end)) {
+    out.assign(buf, end);
+  } else if (auto r = std::to_chars(buf, buf + sizeof buf, value, std::chars_format::fixed, places);
+             r.ec == std::errc()) {
     out.assign(buf, r.ptr);
   } else {
     char pattern[16];
@@ -196,17 +236,18 @@ std::string DecimalText(double value, int places, const LocaleInfo& locale) {
   return out;
 }
 
-int DecimalPlaces(const FieldDef& field) {
-  if (field.type() == FieldType::Calculated) {
-    switch (field.resultFormat()) {
-      case 0: return 4;
-      case 4: return 3;
-      case 5: return 2;
-      case 6: return 1;
-      default: return 0;
-    }
+int ResultPlaces(uint8_t resultFormat) {
+  switch (resultFormat) {
+    case 0: return 4;
+    case 4: return 3;
+    case 5: return 2;
+    case 6: return 1;
+    default: return 0;
   }
-  return field.Places();
+}
+
+int DecimalPlaces(const FieldDef& field) {
+  return field.type() == FieldType::Calculated ? ResultPlaces(field.resultFormat()) : field.Places();
 }
 
 std::string ValueText(const ValueContext& ctx, ByteView record, int fieldSlot) {

@@ -65,6 +65,8 @@ std::string SecondsText(long seconds);
 // The number printed with `places` decimals in a field of 12, leading
 // blanks removed, "." replaced by "," when the decimal separator is not ".".
 std::string DecimalText(double value, int places, const LocaleInfo& locale);
+// Decimal places of a Calculated field's result in `resultFormat`.
+int ResultPlaces(uint8_t resultFormat);
 // Decimal places of a number shown for `field`: a Calculated field's from
 // its result format, other fields' from their size.
 int DecimalPlaces(const FieldDef& field);

@@ -1,5 +1,10 @@
 #include <gtest/gtest.h>
 
+#include <charconv>
+#include <cmath>
+#include <random>
+#include <vector>
+
 #include "engine/dates.h"
 #include "engine/value_text.h"
 #include "tests/engine/test_databases.h"
@@ -193,6 +198,33 @@ TEST(DecimalTextTest, PlacesAndDecimalSeparator) {
   EXPECT_EQ(DecimalText(-2.5, 4, dot), "-2.5000");
   EXPECT_EQ(DecimalText(7, 0, dot), "7");
   EXPECT_EQ(DecimalText(123456789.125, 3, dot), "123456789.125");
+}
+
+// Most values are printed without the general conversion; every one must
+// still come out as printf rounds the exact binary value, ties and values
+// that round to a signed zero included.
+TEST(DecimalTextTest, AgreesWithTheExactConversion) {
+  const LocaleInfo dot;
+  auto exact = [](double v, int places) {
+    char buf[512];
+    return std::string(buf, std::to_chars(buf, buf + sizeof buf, v, std::chars_format::fixed, places).ptr);
+  };
+  std::vector<double> values = {0.0, -0.0, 0.5, -0.5, 1.5, 2.5, 0.125, 0.375, -0.125, 1e-300, -1e-300,
+                                0.005, 0.015, 1.005, 2.675, 0.00005, -0.00004, 0x1p42, -0x1p42 + 0.25,
+                                4398046511103.75, 1e15, 123456789.125, 99999.99995, -0.0049999};
+  std::mt19937_64 random(7);
+  for (int i = 0; i < 100000; ++i) {
+    const uint64_t bits = random();
+    values.push_back(static_cast<double>(static_cast<int64_t>(bits % 20000001) - 10000000) / 100.0);
+    values.push_back(static_cast<double>(bits % 1000000) / 1024.0);  // exact binary ties
+    values.push_back(std::ldexp(static_cast<double>(bits >> 11), -static_cast<int>(bits % 64)));
+    values.push_back(static_cast<double>(bits % 100000) * (static_cast<double>(random() % 10000) / 100.0));
+  }
+  for (double v : values) {
+    for (int places = 0; places <= 4; ++places) {
+      ASSERT_EQ(DecimalText(v, places, dot), exact(v, places)) << std::hexfloat << v << " " << places;
+    }
+  }
 }
 
 TEST(DecimalTextTest, PlacesOfAField) {

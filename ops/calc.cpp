@@ -20,25 +20,27 @@ constexpr size_t kResultChars = 14;
 constexpr size_t kPrefetchRecords = 2;
 
 // Where each slot of the record being worked on starts (FieldOffset of
-// every slot), found in one walk and moved along when a slot is resized. A
-// record's calculated fields read and write several slots each, and a walk
-// from the first slot for every one of them took longer than the
-// arithmetic.
+// every slot up to the last one a pass uses), found in one walk and moved
+// along when a slot is resized. A record's calculated fields read and write
+// several slots each, and a walk from the first slot for every one of them
+// took longer than the arithmetic.
 class SlotIndex {
  public:
-  void Build(ByteView record) {
+  void Build(ByteView record, int last = format::kFieldCount - 1) {
+    last_ = last;
     size_t off = DataStart(record);
     int slot = 0;
-    for (; slot < format::kFieldCount; ++slot) {
+    for (; slot <= last; ++slot) {
       if (off + 2 > record.size()) break;
       const uint16_t len = GetLE16(record.data() + off);
       if (len == format::kEndMark) break;
       offset_[slot] = static_cast<int>(off + 2);
       off += 2 + size_t{len};
     }
-    for (; slot < format::kFieldCount; ++slot) offset_[slot] = -1;
+    for (; slot <= last; ++slot) offset_[slot] = -1;
   }
-  int Offset(int slot) const { return slot >= 0 && slot < format::kFieldCount ? offset_[slot] : -1; }
+  // Only slots up to the `last` given to Build may be asked for.
+  int Offset(int slot) const { return slot >= 0 && slot <= last_ ? offset_[slot] : -1; }
   // FieldValue(record, slot) of the record the index was built for.
   std::optional<ByteView> Value(ByteView record, int slot) const {
     const int off = Offset(slot);
@@ -50,25 +52,54 @@ class SlotIndex {
   // Slot `slot` now takes `delta` bytes more: the slots after it moved by
   // as much.
   void Resized(int slot, std::ptrdiff_t delta) {
-    for (int s = slot + 1; s < format::kFieldCount; ++s) {
+    for (int s = slot + 1; s <= last_; ++s) {
       if (offset_[s] >= 0) offset_[s] += static_cast<int>(delta);
     }
   }
 
  private:
   std::array<int, format::kFieldCount> offset_{};
+  int last_ = -1;
 };
+
+// A Calculated field with what is the same for every record worked out
+// once: its operands, their constants as numbers and its result format.
+struct PlannedField {
+  int field = -1;
+  uint8_t operation = 0;
+  uint8_t resultFormat = 0;
+  std::array<CalcOperand, 2> operand;
+  std::array<double, 2> constant{};
+};
+
+PlannedField Plan(const Schema& schema, int field) {
+  const FieldDef& def = schema.field[field];
+  PlannedField plan;
+  plan.field = field;
+  plan.operation = def.calcOperation;
+  plan.resultFormat = def.resultFormat();
+  plan.operand = {CalcOperand1(def), CalcOperand2(def)};
+  if (!plan.operand[0].IsField()) plan.constant[0] = ParseDouble(def.Constant1());
+  if (!plan.operand[1].IsField()) plan.constant[1] = ParseDouble(def.Constant2());
+  return plan;
+}
 
 // What one pass needs besides the session: the view test prepared once and
 // the fields to evaluate, in display order.
 struct Pass {
   DataSession& session;
   ViewTester tester;
-  std::vector<int> fields;
+  std::vector<PlannedField> fields;
+  // The last slot any of the fields reads or writes.
+  int lastSlot = -1;
   // The record being worked on, kept between records so that a walk over
   // the whole file does not allocate for each one, and its slots.
   mutable Bytes work;
   mutable SlotIndex slots;
+  // The record a walk finished last and its slots, for the fields that
+  // read the previous record: after a sort its bytes lie far away.
+  mutable size_t previous = SIZE_MAX;
+  mutable SlotIndex previousSlots;
 
   Pass(DataSession& s, bool onlyPrevRecordFields) : session(s), tester(s.db, s.Link()) {
     const Schema& schema = s.db.schema();
@@ -77,7 +108,11 @@ struct Pass {
       if (f >= format::kFieldCount || done[f] || !IsCalculated(schema, f)) continue;
       done[f] = true;
       if (onlyPrevRecordFields && (schema.field[f].calcFlags & 3) == 0) continue;
-      fields.push_back(f);
+      fields.push_back(Plan(schema, f));
+      lastSlot = std::max(lastSlot, int{f});
+      for (const CalcOperand& op : fields.back().operand) {
+        if (op.IsField() && op.field < format::kFieldCount) lastSlot = std::max(lastSlot, op.field);
+      }
     }
   }
 };
@@ -117,15 +152,18 @@ void StoreSlotText(Bytes& record, int field, std::string_view text, const Schema
 
 double OperandOf(const Database& db, std::optional<ByteView> value, int field);
 
-double Operand(const Pass& pass, const CalcOperand& op, const std::string& constant, ByteView record,
+double Operand(const Pass& pass, const PlannedField& plan, int which, ByteView record,
                const SlotIndex& slots, size_t index) {
-  if (!op.IsField()) return ParseDouble(constant);
+  const CalcOperand& op = plan.operand[which];
+  if (!op.IsField()) return plan.constant[which];
   const Database& db = pass.session.db;
   if (op.fromPrevious) {
     size_t p = index;
     while (p > 0) {
       --p;
-      if (pass.tester.InView(p)) return FieldOperandValue(db, db.record(p), op.field);
+      if (!pass.tester.InView(p)) continue;
+      if (p == pass.previous) return OperandOf(db, pass.previousSlots.Value(db.record(p), op.field), op.field);
+      return FieldOperandValue(db, db.record(p), op.field);
     }
     return 0.0;
   }
@@ -133,21 +171,20 @@ double Operand(const Pass& pass, const CalcOperand& op, const std::string& const
 }
 
 // `slots` indexes `record` and is kept up to date with it.
-int Evaluate(const Pass& pass, int field, Bytes& record, SlotIndex& slots, size_t index) {
+void Evaluate(const Pass& pass, const PlannedField& plan, Bytes& record, SlotIndex& slots, size_t index) {
   DataSession& s = pass.session;
-  const Schema& schema = s.db.schema();
-  if (!IsCalculated(schema, field)) return -1;
-  const FieldDef& def = schema.field[field];
-  const double a = Operand(pass, CalcOperand1(def), def.Constant1(), record, slots, index);
-  const double b = Operand(pass, CalcOperand2(def), def.Constant2(), record, slots, index);
-  const std::string text = CalcResultText(ApplyOperation(def.calcOperation, a, b), def.resultFormat(), s.locale);
+  const double a = Operand(pass, plan, 0, record, slots, index);
+  const double b = Operand(pass, plan, 1, record, slots, index);
+  const std::string text = CalcResultText(ApplyOperation(plan.operation, a, b), plan.resultFormat, s.locale);
 
-  std::optional<ByteView> old = slots.Value(record, field);
-  if (!old || ValueView(*old) != text) s.calc.fieldChanged[field] = 1;
-  const bool sameBytes = old && old->size() == text.size() + 1 &&
-                         std::equal(text.begin(), text.end(), old->begin()) && (*old)[text.size()] == 0;
-  if (!sameBytes) StoreSlotText(record, field, text, schema, &slots);
-  return 0;
+  std::optional<ByteView> old = slots.Value(record, plan.field);
+  // Nearly every result is the one stored: that needs no closer look.
+  if (old && old->size() == text.size() + 1 && std::equal(text.begin(), text.end(), old->begin()) &&
+      (*old)[text.size()] == 0) {
+    return;
+  }
+  if (!old || ValueView(*old) != text) s.calc.fieldChanged[plan.field] = 1;
+  StoreSlotText(record, plan.field, text, s.db.schema(), &slots);
 }
 
 // `arena`, when given, holds the replaced records of a pass over many.
@@ -157,8 +194,8 @@ int RecalculateWith(const Pass& pass, size_t index, RecordArena* arena = nullptr
   ByteView stored = db.record(index);
   Bytes& work = pass.work;
   work.assign(stored.begin(), stored.end());
-  pass.slots.Build(work);
-  for (int f : pass.fields) Evaluate(pass, f, work, pass.slots, index);
+  pass.slots.Build(work, pass.lastSlot);
+  for (const PlannedField& plan : pass.fields) Evaluate(pass, plan, work, pass.slots, index);
   if (!std::equal(work.begin(), work.end(), stored.begin(), stored.end())) {
     if (arena) {
       db.ReplaceRecord(index, ByteView(work), *arena);
@@ -166,6 +203,9 @@ int RecalculateWith(const Pass& pass, size_t index, RecordArena* arena = nullptr
       db.ReplaceRecord(index, ByteView(work));
     }
   }
+  // The record now holds exactly `work`, which the slots index.
+  pass.previous = index;
+  pass.previousSlots = pass.slots;
   return 0;
 }
 
@@ -284,19 +324,18 @@ double OperandOf(const Database& db, std::optional<ByteView> value, int field) {
 }  // namespace
 
 std::string CalcResultText(double value, uint8_t resultFormat, const LocaleInfo& locale) {
-  FieldDef def;
-  def.typeNumber = static_cast<int16_t>(FieldType::Calculated);
-  def.setResultFormat(resultFormat);
-  std::string text = DecimalText(value, DecimalPlaces(def), locale);
+  std::string text = DecimalText(value, ResultPlaces(resultFormat), locale);
   if (text.size() > kResultChars) text.resize(kResultChars);
   return text;
 }
 
 int EvaluateField(DataSession& session, int field, Bytes& record, size_t index) {
+  if (!IsCalculated(session.db.schema(), field)) return -1;
   Pass pass(session, false);
   SlotIndex slots;
   slots.Build(record);
-  return Evaluate(pass, field, record, slots, index);
+  Evaluate(pass, Plan(session.db.schema(), field), record, slots, index);
+  return 0;
 }
 
 int RecalculateRecord(DataSession& session, size_t index) {

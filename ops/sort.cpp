@@ -8,7 +8,6 @@
 #include "ops/calc.h"
 #include "ops/compare.h"
 #include "ops/field_values.h"
-#include "ops/position_sort.h"
 #include "ops/sort_keys.h"
 
 namespace cx {
@@ -56,14 +55,11 @@ void SortAll(Database& db) {
   const size_t count = db.recordCount();
   if (db.schema().sortKey[0].Field() == -1 || count < 2) return;
   SortKeyTable keys(db);
-  SortKeyTable::Rows& rows = keys.rows();
-  SortPositions(
-      static_cast<long>(count), [&](long x, long y) { return keys.Compare(rows[x], rows[y]); },
-      [&](long x, long y) { std::swap(rows[x], rows[y]); });
+  keys.Sort();
   RecordTable& table = db.table();
   RecordTable sorted;
   sorted.reserve(count);
-  for (const SortKeyTable::Row& row : rows) sorted.push_back(std::move(table[row.record]));
+  for (size_t i = 0; i < count; ++i) sorted.push_back(std::move(table[keys.RecordAt(i)]));
   table.swap(sorted);
   db.MarkChanged();
 }

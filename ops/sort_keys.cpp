@@ -1,12 +1,17 @@
 #include "ops/sort_keys.h"
 
 #include <algorithm>
+#include <array>
+#include <bit>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <thread>
 
+#include "engine/byte_order.h"
 #include "ops/database_settings.h"
 #include "ops/field_values.h"
+#include "ops/position_sort.h"
 
 namespace cx {
 namespace {
@@ -28,9 +33,22 @@ class TextRanks {
       prefix = (prefix << 8) | (i < text.size() ? static_cast<unsigned char>(LowerAscii(text[i])) : 0);
     }
     at_.push_back({prefix, row, static_cast<uint32_t>(buffer_.size()), static_cast<uint32_t>(text.size())});
-    for (char c : text) buffer_.push_back(LowerAscii(c));
+    const size_t at = buffer_.size();
+    buffer_.resize(at + text.size());
+    std::transform(text.begin(), text.end(), buffer_.begin() + static_cast<std::ptrdiff_t>(at),
+                   [](char c) { return LowerAscii(c); });
   }
   void Reserve(size_t texts) { at_.reserve(texts); }
+  // Takes over the texts of `other`, added for other rows.
+  void Append(const TextRanks& other) {
+    const auto shift = static_cast<uint32_t>(buffer_.size());
+    buffer_ += other.buffer_;
+    at_.reserve(at_.size() + other.at_.size());
+    for (Entry e : other.at_) {
+      e.offset += shift;
+      at_.push_back(e);
+    }
+  }
   size_t size() const { return at_.size(); }
   // Calls set(row, rank) for every text added.
   template <typename Set>
@@ -38,7 +56,10 @@ class TextRanks {
     auto view = [&](const Entry& e) { return std::string_view(buffer_.data() + e.offset, e.length); };
     auto less = [&](const Entry& a, const Entry& b) {
       if (a.prefix != b.prefix) return a.prefix < b.prefix;
-      return (a.length > 8 || b.length > 8) && view(a) < view(b);
+      if (a.length <= 8 && b.length <= 8) return false;
+      // The prefixes hold the first eight bytes of both.
+      if (a.length >= 8 && b.length >= 8) return view(a).substr(8) < view(b).substr(8);
+      return view(a) < view(b);
     };
     std::sort(at_.begin(), at_.end(), less);
     int64_t rank = 0;
@@ -60,6 +81,26 @@ class TextRanks {
 // Below this many texts a key's ranking is done sooner than a thread is
 // started for it.
 constexpr size_t kTextsRankedAside = 8192;
+// Below this many records the keys are read sooner than a thread is
+// started for half of them.
+constexpr size_t kRowsReadAside = 16384;
+
+// The values of slots 0 .. `last` of a record, found in one walk (nothing
+// for a slot past the record's end).
+void SlotValuesUpTo(ByteView record, int last,
+                    std::array<std::optional<ByteView>, format::kFieldCount>& values) {
+  size_t off = DataStart(record);
+  int slot = 0;
+  for (; slot <= last; ++slot) {
+    if (off + 2 > record.size()) break;
+    const size_t len = GetLE16(record.data() + off);
+    if (len == format::kEndMark) break;
+    const size_t at = off + 2;
+    values[slot] = record.subspan(at, std::min(len, record.size() - at));
+    off = at + len;
+  }
+  for (; slot <= last; ++slot) values[slot] = std::nullopt;
+}
 
 }  // namespace
 
@@ -120,18 +161,20 @@ class SortKeyReader {
     }
   }
 
-  void Read(ByteView value, int k, SortKeyTable::Row& row) {
+  // Reads the key into `row`, its text (if any) into `texts`: this
+  // reader's own or those of another part of the table.
+  void Read(ByteView value, int k, SortKeyTable::Row& row, TextRanks& texts) {
     row.state[k] = 1;
     const uint8_t firstByte = value.empty() ? 0 : value[0];
     switch (type_) {
       case FieldType::Text:
       case FieldType::Note:
       case FieldType::DBPopup:
-        texts_.Add(row.record, ValueView(value));
+        texts.Add(row.record, ValueView(value));
         break;
       case FieldType::Linked:
         if (std::optional<std::string_view> text = LinkedText(value)) {
-          texts_.Add(row.record, *text);
+          texts.Add(row.record, *text);
         } else {
           row.state[k] = 2;
         }
@@ -171,6 +214,7 @@ class SortKeyReader {
     texts_.Assign([&](uint32_t record, int64_t rank) { rows[record].value[k].number = rank; });
   }
   size_t texts() const { return texts_.size(); }
+  TextRanks& ownTexts() { return texts_; }
 
  private:
   int field_;
@@ -193,18 +237,44 @@ SortKeyTable::SortKeyTable(const Database& db) {
   keys_ = static_cast<int>(readers.size());
 
   // One pass over the records, reading every key from a record while its
-  // bytes are at hand.
+  // bytes are at hand, in one walk over its slots. A large table is read
+  // in two halves at once, the second half's texts kept apart and joined
+  // to the first's before ranking.
   const size_t count = db.recordCount();
   for (SortKeyReader& reader : readers) reader.Reserve(count);
   rows_.resize(count);
-  for (size_t i = 0; i < count; ++i) {
-    Row& row = rows_[i];
-    const ByteView record = db.record(i);
-    row.record = static_cast<uint32_t>(i);
-    row.noData = record.empty();
-    for (int k = 0; k < keys_; ++k) {
-      if (std::optional<ByteView> value = FieldValue(record, readers[k].field())) readers[k].Read(*value, k, row);
+  int lastSlot = -1;
+  for (const SortKeyReader& reader : readers) {
+    if (reader.field() < format::kFieldCount) lastSlot = std::max(lastSlot, reader.field());
+  }
+  auto readRows = [&](size_t from, size_t to, std::array<TextRanks*, 3> texts) {
+    std::array<std::optional<ByteView>, format::kFieldCount> values;
+    for (size_t i = from; i < to; ++i) {
+      Row& row = rows_[i];
+      const ByteView record = db.record(i);
+      row.record = static_cast<uint32_t>(i);
+      row.noData = record.empty();
+      SlotValuesUpTo(record, lastSlot, values);
+      for (int k = 0; k < keys_; ++k) {
+        const int field = readers[k].field();
+        if (field >= 0 && field < format::kFieldCount && values[field]) {
+          readers[k].Read(*values[field], k, row, *texts[k]);
+        }
+      }
     }
+  };
+  std::array<TextRanks*, 3> own{};
+  for (int k = 0; k < keys_; ++k) own[k] = &readers[k].ownTexts();
+  if (count >= kRowsReadAside && std::thread::hardware_concurrency() > 1) {
+    std::array<TextRanks, 3> later;
+    std::array<TextRanks*, 3> laterTexts{&later[0], &later[1], &later[2]};
+    const size_t half = count / 2;
+    std::thread second([&] { readRows(half, count, laterTexts); });
+    readRows(0, half, own);
+    second.join();
+    for (int k = 0; k < keys_; ++k) own[k]->Append(later[k]);
+  } else {
+    readRows(0, count, own);
   }
   // Ranking a key's texts sorts them; of two such keys in a large file,
   // the first is ranked on a second thread. Each writes only its own key
@@ -257,6 +327,87 @@ int SortKeyTable::Compare(const Row& rowA, const Row& rowB) const {
     if (r != 0) return r;
   }
   return 0;
+}
+
+// Packing needs every row to hold every key (a missing slot or record
+// makes Compare answer in ways no single number can), numbers that compare
+// as plain integers (no reals; wrapped differences only when all values lie
+// within 2^31 of each other, read as unsigned or as signed numbers) and at
+// most 64 bits for all keys together.
+bool SortKeyTable::Pack() {
+  if (rows_.empty()) return false;
+  // Per key, what each value is turned into before packing: an xor that
+  // puts it in unsigned order, then the offset from the smallest.
+  std::array<uint64_t, 3> flip{}, low{}, span{};
+  std::array<bool, 3> any{};
+  auto unsignedValue = [&](const Row& row, int k) {
+    return (rule_[k] == Rule::Wrapped ? static_cast<uint32_t>(row.value[k].number)
+                                      : static_cast<uint64_t>(row.value[k].number)) ^ flip[k];
+  };
+  for (int k = 0; k < keys_; ++k) {
+    if (rule_[k] == Rule::Real) return false;
+    // Ordered values compare as signed numbers; a wrapped difference as
+    // either, whichever keeps the values closer together.
+    const std::array<uint64_t, 2> flips = rule_[k] == Rule::Wrapped
+                                              ? std::array<uint64_t, 2>{0, uint64_t{1} << 31}
+                                              : std::array<uint64_t, 2>{uint64_t{1} << 63, uint64_t{1} << 63};
+    std::array<uint64_t, 2> lo{UINT64_MAX, UINT64_MAX}, hi{};
+    for (const Row& row : rows_) {
+      if (row.noData || row.state[k] == 0) return false;
+      if (rule_[k] == Rule::Equal || row.state[k] == 2) continue;
+      for (int f = 0; f < 2; ++f) {
+        flip[k] = flips[f];
+        const uint64_t v = unsignedValue(row, k);
+        lo[f] = std::min(lo[f], v);
+        hi[f] = std::max(hi[f], v);
+      }
+      any[k] = true;
+    }
+    if (!any[k]) continue;
+    const int f = hi[1] - lo[1] < hi[0] - lo[0] ? 1 : 0;
+    if (rule_[k] == Rule::Wrapped && hi[f] - lo[f] >= (uint64_t{1} << 31)) return false;
+    flip[k] = flips[f];
+    low[k] = lo[f];
+    // A Linked value that is empty comes before all others: it takes 0.
+    span[k] = hi[f] - lo[f] + (rule_[k] == Rule::LinkedRank ? 1 : 0);
+  }
+  std::array<int, 3> width{};
+  int bits = 0;
+  for (int k = 0; k < keys_; ++k) bits += width[k] = static_cast<int>(std::bit_width(span[k]));
+  if (bits > 64) return false;
+
+  packed_.resize(rows_.size());
+  for (size_t i = 0; i < rows_.size(); ++i) {
+    const Row& row = rows_[i];
+    uint64_t key = 0;
+    for (int k = 0; k < keys_; ++k) {
+      uint64_t part = 0;
+      if (any[k] && rule_[k] != Rule::Equal && row.state[k] != 2) {
+        part = unsignedValue(row, k) - low[k] + (rule_[k] == Rule::LinkedRank ? 1 : 0);
+      }
+      if (reverse_[k]) part = span[k] - part;
+      key = width[k] == 64 ? part : (key << width[k]) | part;
+    }
+    packed_[i] = {key, row.record};
+  }
+  return true;
+}
+
+void SortKeyTable::Sort() {
+  const long count = static_cast<long>(rows_.size());
+  if (Pack()) {
+    SortPositions(
+        count,
+        [this](long x, long y) {
+          const uint64_t a = packed_[x].key, b = packed_[y].key;
+          return (a > b) - (a < b);
+        },
+        [this](long x, long y) { std::swap(packed_[x], packed_[y]); });
+    return;
+  }
+  SortPositions(
+      count, [this](long x, long y) { return Compare(rows_[x], rows_[y]); },
+      [this](long x, long y) { std::swap(rows_[x], rows_[y]); });
 }
 
 }  // namespace cx

@@ -37,12 +37,27 @@ class SortKeyTable {
   Rows& rows() { return rows_; }
   int Compare(const Row& a, const Row& b) const;
 
+  // Puts the records in order with SortPositions; RecordAt(position) then
+  // names the record at each position.
+  void Sort();
+  uint32_t RecordAt(size_t position) const {
+    return packed_.empty() ? rows_[position].record : packed_[position].record;
+  }
+
  private:
+  // All keys of a row in one number that compares as Compare() does.
+  struct PackedRow {
+    uint64_t key;
+    uint32_t record;
+  };
+  bool Pack();
+
   // How one key's values compare, after the missing-slot rule.
   enum class Rule : uint8_t { Equal, Wrapped, Ordered, Real, LinkedRank };
   friend class SortKeyReader;
 
   Rows rows_;
+  std::vector<PackedRow, LargePageAllocator<PackedRow>> packed_;
   int keys_ = 0;
   std::array<Rule, 3> rule_{};
   std::array<bool, 3> reverse_{};

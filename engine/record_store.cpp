@@ -336,7 +336,62 @@ Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) 
 
 Status Database::Save(const Clock& clock) { return SaveAs(path_, clock); }
 
-Status Database::SaveAs(const std::string& target, const Clock& clock) {
+Status Database::SaveAs(const std::string& target, const Clock& clock) { return Write(target, clock, nullptr); }
+
+Status Database::SaveAlong(const RecordsReady& ready, const Clock& clock) { return Write(path_, clock, &ready); }
+
+bool Database::EncodeHead(const Clock& clock, size_t schemaSize,
+                          const std::array<Bytes, format::kPopupRecords>& popups, Header& header,
+                          Bytes& head) const {
+  const size_t numRecords = format::kFirstDataRecord + records_.size();
+  header = header_;
+  header.numRecords = static_cast<uint16_t>(numRecords);
+  header.appInfoID = static_cast<uint32_t>(80 + format::kEntrySize * numRecords);
+  int64_t now = clock.Now() + (clock.DaylightSaving() ? 3600 : 0);
+  header.modificationDate = static_cast<uint32_t>(now);
+
+  // Entry list, built in one block.
+  head.assign(format::kHeaderSize + format::kEntrySize * numRecords + format::kGapSize + format::kAppInfoSize,
+              0);
+  EncodeHeader(header, head.data());
+  uint64_t offset = header.appInfoID + format::kAppInfoSize;
+  uint8_t* entry = head.data() + format::kHeaderSize;
+  auto putEntry = [&](uint8_t attributes, uint32_t uniqueID, size_t size) {
+    EncodeEntry({static_cast<uint32_t>(offset), attributes, uniqueID}, entry);
+    entry += format::kEntrySize;
+    offset += size;
+  };
+  uint8_t schemaAttr = static_cast<uint8_t>(schemaAttributes_ & ~format::kDirtyBit);
+  if (changed_) schemaAttr |= format::kDirtyBit;
+  putEntry(schemaAttr, schemaUniqueID_, schemaSize);
+  for (int i = 0; i < format::kPopupRecords; ++i) {
+    putEntry(popups_[i].attributes, popups_[i].uniqueID, popups[i].size());
+  }
+  for (const DataRecord& r : records_) putEntry(r.attributes(), r.uniqueID(), r.size());
+  return offset <= UINT32_MAX;
+}
+
+void Database::WriteRecords(SafeFileWriter& out, size_t from, size_t to) const {
+  // Records that still lie side by side in the file they were read from go
+  // out in one write each run (after an unchanged open: the whole data part).
+  for (size_t i = from; i < to;) {
+    const uint8_t* start = records_[i].bytes().data();
+    size_t run = records_[i].size();
+    size_t j = i + 1;
+    while (j < to && records_[j].bytes().data() == start + run) run += records_[j++].size();
+    out.Write(start, run);
+    i = j;
+  }
+}
+
+Status Database::Write(const std::string& target, const Clock& clock, const RecordsReady* ready) {
+  SafeFileWriter out(target);
+  // Along with a pass, nothing of the database is looked at before the
+  // pass has finished its first records; the new file can be made meanwhile.
+  if (ready) {
+    if (Status s = out.Open(); !s) return s;
+    ready->WaitBeyond(0);
+  }
   if (partial_ && SameFile(target, path_)) {
     return Status::Error(
         "ERROR: This database could only be read in part.\nSave it under another name so that "
@@ -348,52 +403,40 @@ Status Database::SaveAs(const std::string& target, const Clock& clock) {
   }
   const size_t numRecords = format::kFirstDataRecord + records_.size();
   if (numRecords > format::kMaxFileRecords) return Status::Error("ERROR: Too many records to save");
-
-  Header header = header_;
-  header.numRecords = static_cast<uint16_t>(numRecords);
-  header.appInfoID = static_cast<uint32_t>(80 + format::kEntrySize * numRecords);
-  int64_t now = clock.Now() + (clock.DaylightSaving() ? 3600 : 0);
-  header.modificationDate = static_cast<uint32_t>(now);
+  const Status tooLarge = Status::Error("ERROR: The database is too large to save");
 
   const Bytes schemaBytes = WriteSchema(schema_);
   std::array<Bytes, format::kPopupRecords> popupBytes;
   for (int i = 0; i < format::kPopupRecords; ++i) popupBytes[i] = popups_[i].Encode();
-
-  // Entry list, built in one block.
-  Bytes head(format::kHeaderSize + format::kEntrySize * numRecords + format::kGapSize +
-                 format::kAppInfoSize,
-             0);
-  EncodeHeader(header, head.data());
-  uint64_t offset = header.appInfoID + format::kAppInfoSize;
-  uint8_t* entry = head.data() + format::kHeaderSize;
-  auto putEntry = [&](uint8_t attributes, uint32_t uniqueID, size_t size) {
-    EncodeEntry({static_cast<uint32_t>(offset), attributes, uniqueID}, entry);
-    entry += format::kEntrySize;
-    offset += size;
-  };
-  uint8_t schemaAttr = static_cast<uint8_t>(schemaAttributes_ & ~format::kDirtyBit);
-  if (changed_) schemaAttr |= format::kDirtyBit;
-  putEntry(schemaAttr, schemaUniqueID_, schemaBytes.size());
-  for (int i = 0; i < format::kPopupRecords; ++i) {
-    putEntry(popups_[i].attributes, popups_[i].uniqueID, popupBytes[i].size());
-  }
-  for (const DataRecord& r : records_) putEntry(r.attributes(), r.uniqueID(), r.size());
-  if (offset > UINT32_MAX) return Status::Error("ERROR: The database is too large to save");
-
-  SafeFileWriter out(target);
-  if (Status s = out.Open(); !s) return s;
-  out.Write(head.data(), head.size());
-  out.Write(schemaBytes.data(), schemaBytes.size());
-  for (const Bytes& p : popupBytes) out.Write(p.data(), p.size());
-  // Records that still lie side by side in the file they were read from go
-  // out in one write each run (after an unchanged open: the whole data part).
-  for (size_t i = 0; i < records_.size();) {
-    const uint8_t* start = records_[i].bytes().data();
-    size_t run = records_[i].size();
-    size_t j = i + 1;
-    while (j < records_.size() && records_[j].bytes().data() == start + run) run += records_[j++].size();
-    out.Write(start, run);
-    i = j;
+  Header header;
+  Bytes head;
+  if (!ready) {
+    if (!EncodeHead(clock, schemaBytes.size(), popupBytes, header, head)) return tooLarge;
+    if (Status s = out.Open(); !s) return s;
+    out.Write(head.data(), head.size());
+    out.Write(schemaBytes.data(), schemaBytes.size());
+    for (const Bytes& p : popupBytes) out.Write(p.data(), p.size());
+    WriteRecords(out, 0, records_.size());
+  } else {
+    // The records go first, each run as soon as the pass is done with it;
+    // what comes before them is known only once every record is final.
+    Bytes front(format::kHeaderSize + format::kEntrySize * numRecords + format::kGapSize +
+                format::kAppInfoSize);
+    front.insert(front.end(), schemaBytes.begin(), schemaBytes.end());
+    for (const Bytes& p : popupBytes) front.insert(front.end(), p.begin(), p.end());
+    out.SkipTo(front.size());
+    const size_t count = records_.size();
+    size_t done = 0;
+    for (size_t now = ready->WaitBeyond(0); done < count || now != RecordsReady::kAll;
+         now = ready->WaitBeyond(now)) {
+      const size_t upTo = std::min(now, count);
+      WriteRecords(out, done, upTo);
+      done = std::max(done, upTo);
+      if (now == RecordsReady::kAll) break;
+    }
+    if (!EncodeHead(clock, schemaBytes.size(), popupBytes, header, head)) return tooLarge;
+    std::copy(head.begin(), head.end(), front.begin());
+    out.WriteAt(0, front.data(), front.size());
   }
   if (Status s = out.Commit(); !s) return s;
 

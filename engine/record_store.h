@@ -2,6 +2,8 @@
 // lists and data records, held in memory between opening and saving.
 #pragma once
 
+#include <array>
+#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -70,6 +72,35 @@ class RecordArena {
   size_t used_ = 0;
 };
 
+// How many records of a database, from the first, a pass that changes
+// them has finished with: a save running beside the pass (SaveAlong)
+// writes those while the pass goes on. Advance and Finish come from the
+// pass's thread, WaitBeyond from the saving one.
+class RecordsReady {
+ public:
+  static constexpr size_t kAll = SIZE_MAX;
+  // The records below `count` will not change again.
+  void Advance(size_t count) {
+    ready_.store(count, std::memory_order_release);
+    ready_.notify_one();
+  }
+  // No record will change again, nor anything else the file holds.
+  void Finish() { Advance(kAll); }
+  // Blocks until more than `count` records are final; how many are
+  // (kAll once Finish was called).
+  size_t WaitBeyond(size_t count) const {
+    size_t now = ready_.load(std::memory_order_acquire);
+    while (now <= count) {
+      ready_.wait(now, std::memory_order_acquire);
+      now = ready_.load(std::memory_order_acquire);
+    }
+    return now;
+  }
+
+ private:
+  std::atomic<size_t> ready_{0};
+};
+
 // Every data record of a file, in file order.
 using RecordTable = std::vector<DataRecord, LargePageAllocator<DataRecord>>;
 
@@ -120,6 +151,13 @@ class Database {
   // word. See ChangedOnDisk and AcceptDiskState.
   Status Save(const Clock& clock = DefaultClock());
   Status SaveAs(const std::string& path, const Clock& clock = DefaultClock());
+  // Save() on a thread of its own while another thread finishes the
+  // records (a recalculation), so that writing them overlaps that work.
+  // Until its first Advance of `ready` the other thread may still do
+  // anything with the database; from then until Finish it may change only
+  // the bytes of records at or after the mark, and add, remove or move
+  // none.
+  Status SaveAlong(const RecordsReady& ready, const Clock& clock = DefaultClock());
 
   // True when the file at path() is no longer the one this database was
   // read from or last saved to (another program replaced or rewrote it).
@@ -176,6 +214,13 @@ class Database {
 
  private:
   Status Load(const std::string& path, RecordSource source, UiPort& ui);
+  Status Write(const std::string& target, const Clock& clock, const RecordsReady* ready);
+  // The header and entry list for the records as they are now; false when
+  // the file would be too large.
+  bool EncodeHead(const Clock& clock, size_t schemaSize, const std::array<Bytes, format::kPopupRecords>& popups,
+                  Header& header, Bytes& head) const;
+  // Records [from, to), those that lie side by side in one write each.
+  void WriteRecords(SafeFileWriter& out, size_t from, size_t to) const;
 
   std::string path_;
   Header header_;

@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <array>
+#include <system_error>
+#include <thread>
 #include <vector>
 
 #include "engine/byte_order.h"
@@ -100,6 +102,8 @@ struct Pass {
   // read the previous record: after a sort its bytes lie far away.
   mutable size_t previous = SIZE_MAX;
   mutable SlotIndex previousSlots;
+  // Told how far a walk got, when a save writes the records meanwhile.
+  RecordsReady* ready = nullptr;
 
   Pass(DataSession& s, bool onlyPrevRecordFields) : session(s), tester(s.db, s.Link()) {
     const Schema& schema = s.db.schema();
@@ -209,13 +213,18 @@ int RecalculateWith(const Pass& pass, size_t index, RecordArena* arena = nullptr
   return 0;
 }
 
+// How many records a walk finishes between two reports to a save.
+constexpr size_t kReadyStep = 512;
+
 // Every record from `start` on, or only those in view when the view is
 // restricted. Stops at the first failure.
 int Walk(const Pass& pass, size_t start) {
   const bool restricted = pass.tester.Restricted();
   RecordArena arena;
   const Database& db = pass.session.db;
+  if (pass.ready) pass.ready->Advance(start);
   for (size_t i = start; i < db.recordCount(); ++i) {
+    if (pass.ready && i > start && (i - start) % kReadyStep == 0) pass.ready->Advance(i);
     // After a sort the records lie scattered over the file read in: ask
     // for the next ones while this one is worked on, or the walk spends
     // its time waiting for memory.
@@ -226,6 +235,7 @@ int Walk(const Pass& pass, size_t start) {
     if (restricted && !pass.tester.InView(i)) continue;
     if (RecalculateWith(pass, i, &arena) != 0) return -1;
   }
+  if (pass.ready) pass.ready->Advance(db.recordCount());
   return 0;
 }
 
@@ -370,7 +380,10 @@ int RecalculateFrom(DataSession& session, size_t start) {
   }
 
   session.ui.Status("Recalculating Fields...");
-  if (Walk(Pass(session, false), start) != 0) return finish(-1);
+  Pass pass(session, false);
+  // Records that a sort after the walk moves again are not final yet.
+  if (!calc.resortPending) pass.ready = session.savingAlong;
+  if (Walk(pass, start) != 0) return finish(-1);
 
   if (calc.resortPending) {
     SortAll(db);
@@ -393,6 +406,26 @@ int RecalculateAfterMove(DataSession& session, size_t oldIndex, size_t newIndex)
     }
   }
   return 0;
+}
+
+Status RecalculateWhileSaving(DataSession& session, const std::function<void()>& recalculate,
+                              const Clock& clock) {
+  RecordsReady ready;
+  Status saved;
+  std::thread saver;
+  try {
+    saver = std::thread([&] { saved = session.db.SaveAlong(ready, clock); });
+  } catch (const std::system_error&) {
+    // No second thread to be had: one step after the other.
+    recalculate();
+    return session.db.Save(clock);
+  }
+  session.savingAlong = &ready;
+  recalculate();
+  session.savingAlong = nullptr;
+  ready.Finish();
+  saver.join();
+  return saved;
 }
 
 }  // namespace cx

@@ -5,6 +5,7 @@
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <string>
 
 #include "engine/record_store.h"
@@ -61,5 +62,12 @@ int RecalculatePrevRecordFields(DataSession& session);
 // changed field reaches a Calculated field through one. 0 when nothing had
 // to be done, else RecalculateFrom's result.
 int RecalculateAfterMove(DataSession& session, size_t oldIndex, size_t newIndex);
+
+// Runs `recalculate` (a recalculation pass, or steps that end with one)
+// while the database is saved to its file on a second thread, each record
+// written as soon as the pass is done with it: the file is the one that
+// running it and then Database::Save() would give. The save's status.
+Status RecalculateWhileSaving(DataSession& session, const std::function<void()>& recalculate,
+                              const Clock& clock = DefaultClock());
 
 }  // namespace cx

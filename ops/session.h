@@ -48,6 +48,9 @@ struct DataSession {
   std::vector<uint32_t> view;  // record indexes in view, in table order
   FindHit found;
   RecalcState calc;
+  // A save writing the records while a recalculation finishes them
+  // (Database::SaveAlong): the recalculation tells it how far it got.
+  RecordsReady* savingAlong = nullptr;
 
   const LinkRestriction* Link() const { return link ? &*link : nullptr; }
 };

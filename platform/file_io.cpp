@@ -420,6 +420,41 @@ bool SafeFileWriter::Write(const void* data, size_t size) {
   return true;
 }
 
+bool SafeFileWriter::SkipTo(uint64_t offset) {
+  if (failed_ || fd_ < 0) return false;
+  if (direct_) {
+    failed_ = true;
+    error_ = "cannot skip ahead in a special file";
+    return false;
+  }
+  if (!Flush()) return false;
+  if (::lseek(fd_, static_cast<off_t>(offset), SEEK_SET) < 0) {
+    failed_ = true;
+    error_ = ErrnoText();
+    return false;
+  }
+  // What is sent on to the disk while writing counts from here.
+  writtenBytes_ = startedBytes_ = offset;
+  return true;
+}
+
+bool SafeFileWriter::WriteAt(uint64_t offset, const void* data, size_t size) {
+  if (failed_ || fd_ < 0 || !Flush()) return false;
+  const uint8_t* p = static_cast<const uint8_t*>(data);
+  size_t done = 0;
+  while (done < size) {
+    ssize_t n = ::pwrite(fd_, p + done, size - done, static_cast<off_t>(offset + done));
+    if (n < 0 && errno == EINTR) continue;
+    if (n <= 0) {
+      failed_ = true;
+      error_ = n < 0 ? ErrnoText() : "short write";
+      return false;
+    }
+    done += static_cast<size_t>(n);
+  }
+  return true;
+}
+
 Status SafeFileWriter::Commit() {
   if (fd_ < 0) return Status::Error("Cannot write " + target_ + (error_.empty() ? "" : ": " + error_));
   if (!failed_) Flush();

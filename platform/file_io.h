@@ -113,6 +113,11 @@ class SafeFileWriter {
   Status Open();
   // Buffered; a failure is remembered and reported by Commit().
   bool Write(const void* data, size_t size);
+  // For a file whose beginning is known last (a regular file only): the
+  // Write()s after SkipTo go on from `offset`, and WriteAt fills in what
+  // lies before it. Failures as for Write().
+  bool SkipTo(uint64_t offset);
+  bool WriteAt(uint64_t offset, const void* data, size_t size);
   Status Commit();
   void Abandon();
   bool failed() const { return failed_; }

@@ -5,6 +5,7 @@
 #include "cli/command.h"
 #include "cli/database_access.h"
 #include "cli/json_output.h"
+#include "ops/calc.h"
 #include "ops/sort.h"
 #include "platform/text_codec.h"
 
@@ -55,8 +56,12 @@ class SortCommand : public Command {
       choice.forward[k] = forward;
     }
     if (!AcceptSortingDialog(db, choice, ctx.ui)) return kExitFailed;
-    SortAfterDialog(session);
-    if (!SaveForCommand(ctx, db)) return kExitFailed;
+    SortAll(session, false);
+    // The recalculation that follows a sort and the save run side by side.
+    if (Status saved = RecalculateWhileSaving(session, [&] { RecalculateAfterMove(session, 0, 1); }); !saved) {
+      Failure(ctx, saved.message());
+      return kExitFailed;
+    }
     if (ctx.json) {
       PrintCounts(ctx, {{"sorted", static_cast<int64_t>(db.recordCount())}});
       return kExitOk;

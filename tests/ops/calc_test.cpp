@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <random>
 
 #include "ops/calc.h"
 #include "ops/database_settings.h"
@@ -229,6 +230,64 @@ TEST(CalcPassTest, NoCalculatedFieldsStillMarksChanged) {
   EXPECT_EQ(RecalculateFrom(t.session, 0), 0);
   EXPECT_TRUE(t.db.changed());
   EXPECT_EQ(NeedsPrevRecord(t.db), 0);
+}
+
+// A save that writes the records while the recalculation finishes them
+// gives the very file that recalculating and then saving gives: over all
+// records, over those in view only, with a calculated sort key (the walk's
+// records move again after it), and from a record in the middle.
+TEST(CalcSaveAlongTest, SameFileAsRecalculatingThenSaving) {
+  testing::TempDir dir;
+  const FixedClock clock(1700000000);
+  std::mt19937 rng(11);
+  for (int variant = 0; variant < 4; ++variant) {
+    TestDb t;
+    const int qty = t.Field(FieldType::Integer, "Qty");
+    const int keep = t.Field(FieldType::CheckBox, "Keep");
+    const int twice = t.Calc("Twice", kMul, k2Places, qty, kConst, 0, "", "2.5");
+    const int neg = t.Calc("Neg", kSub, kInteger, kConst, qty, 0, "0");
+    const int running = t.Calc("Running", kAdd, kInteger, qty, kConst, 2);
+    t.db.schema().field[running].param2 = static_cast<uint8_t>(running);
+    for (int i = 0; i < 5000; ++i) {
+      t.Add({Num(qty, rng() % 1000), Byte(keep, static_cast<uint8_t>(rng() % 2)), Text(twice, "stale")});
+    }
+    SortOn(t.db, variant == 2 ? neg : qty);
+    if (variant == 1) {
+      FilterSettings f = LoadFilterSettings(t.db.schema());
+      f.filter[0].enabled = true;
+      f.filter[0].field = keep;
+      f.filter[0].lowerNumber = 1;
+      StoreFilterSettings(f, t.db.schema());
+    }
+    const size_t start = variant == 3 ? 1234 : 0;
+
+    Database plain = t.db;
+    DataSession plainSession(plain, t.locale, t.ui);
+    ASSERT_EQ(RecalculateFrom(plainSession, start), 0);
+    ASSERT_TRUE(plain.SaveAs(dir.File("Plain.PDB"), clock));
+
+    t.db.SetPath(dir.File("Along.PDB"));
+    ASSERT_TRUE(RecalculateWhileSaving(t.session, [&] { RecalculateFrom(t.session, start); }, clock));
+    EXPECT_FALSE(t.db.changed());
+    EXPECT_EQ(t.session.savingAlong, nullptr);
+    std::vector<uint8_t> along, plainBytes;
+    ASSERT_TRUE(ReadWholeFile(dir.File("Along.PDB"), along));
+    ASSERT_TRUE(ReadWholeFile(dir.File("Plain.PDB"), plainBytes));
+    EXPECT_TRUE(along == plainBytes) << "variant " << variant;
+  }
+}
+
+// When the save fails the recalculation still runs to its end, and the
+// database stays changed.
+TEST(CalcSaveAlongTest, AFailedSaveLeavesTheRecalculationDone) {
+  TestDb t;  // its file lies in a folder that does not exist
+  const int qty = t.Field(FieldType::Integer, "Qty");
+  const int twice = t.Calc("Twice", kMul, kInteger, qty, kConst, 0, "", "2");
+  for (uint32_t q : {1, 2, 3}) t.Add({Num(qty, q), Text(twice, "stale")});
+  const Status saved = RecalculateWhileSaving(t.session, [&] { RecalculateFrom(t.session, 0); });
+  EXPECT_FALSE(saved);
+  EXPECT_EQ(t.TextAt(2, twice), "6");
+  EXPECT_TRUE(t.db.changed());
 }
 
 TEST(CalcAfterMoveTest, MovesAndChangedFieldsDecide) {

@@ -1,6 +1,7 @@
 #include "ops/sort_keys.h"
 
 #include <algorithm>
+#include <functional>
 #include <array>
 #include <bit>
 #include <optional>
@@ -22,67 +23,110 @@ int Sign(T a, T b) {
 }
 
 // Lower-cased texts and their ranks: equal texts (ignoring case) share a
-// rank, and ranks order as the case-insensitive comparison does. The first
-// eight bytes of each text, packed most significant first, decide most
-// comparisons without looking at the texts.
+// rank, and ranks order as the case-insensitive comparison does. A key's
+// texts repeat a lot (towns, names), so each different text is kept and
+// sorted once, found again through a hash table. The first eight bytes of
+// each text, packed most significant first, decide most comparisons
+// without looking at the texts.
 class TextRanks {
  public:
   void Add(uint32_t row, std::string_view text) {
-    uint64_t prefix = 0;
-    for (size_t i = 0; i < 8; ++i) {
-      prefix = (prefix << 8) | (i < text.size() ? static_cast<unsigned char>(LowerAscii(text[i])) : 0);
-    }
-    at_.push_back({prefix, row, static_cast<uint32_t>(buffer_.size()), static_cast<uint32_t>(text.size())});
-    const size_t at = buffer_.size();
-    buffer_.resize(at + text.size());
-    std::transform(text.begin(), text.end(), buffer_.begin() + static_cast<std::ptrdiff_t>(at),
-                   [](char c) { return LowerAscii(c); });
+    lowered_.resize(text.size());
+    std::transform(text.begin(), text.end(), lowered_.begin(), [](char c) { return LowerAscii(c); });
+    rows_.push_back({row, Find(lowered_, std::hash<std::string_view>{}(lowered_))});
   }
-  void Reserve(size_t texts) { at_.reserve(texts); }
+  void Reserve(size_t texts) { rows_.reserve(texts); }
   // Takes over the texts of `other`, added for other rows.
   void Append(const TextRanks& other) {
-    const auto shift = static_cast<uint32_t>(buffer_.size());
-    buffer_ += other.buffer_;
-    at_.reserve(at_.size() + other.at_.size());
-    for (Entry e : other.at_) {
-      e.offset += shift;
-      at_.push_back(e);
+    std::vector<uint32_t> same(other.distinct_.size());
+    for (size_t d = 0; d < other.distinct_.size(); ++d) {
+      same[d] = Find(other.View(other.distinct_[d]), other.distinct_[d].hash);
     }
+    rows_.reserve(rows_.size() + other.rows_.size());
+    for (const RowText& r : other.rows_) rows_.push_back({r.row, same[r.text]});
   }
-  size_t size() const { return at_.size(); }
+  size_t size() const { return rows_.size(); }
   // Calls set(row, rank) for every text added.
   template <typename Set>
   void Assign(Set set) {
-    auto view = [&](const Entry& e) { return std::string_view(buffer_.data() + e.offset, e.length); };
-    auto less = [&](const Entry& a, const Entry& b) {
+    auto less = [&](uint32_t x, uint32_t y) {
+      const Distinct& a = distinct_[x];
+      const Distinct& b = distinct_[y];
       if (a.prefix != b.prefix) return a.prefix < b.prefix;
       if (a.length <= 8 && b.length <= 8) return false;
       // The prefixes hold the first eight bytes of both.
-      if (a.length >= 8 && b.length >= 8) return view(a).substr(8) < view(b).substr(8);
-      return view(a) < view(b);
+      if (a.length >= 8 && b.length >= 8) return View(a).substr(8) < View(b).substr(8);
+      return View(a) < View(b);
     };
-    std::sort(at_.begin(), at_.end(), less);
-    int64_t rank = 0;
-    for (size_t i = 0; i < at_.size(); ++i) {
-      if (i > 0 && less(at_[i - 1], at_[i])) ++rank;
-      set(at_[i].row, rank);
+    std::vector<uint32_t> order(distinct_.size());
+    for (uint32_t d = 0; d < order.size(); ++d) order[d] = d;
+    std::sort(order.begin(), order.end(), less);
+    std::vector<int64_t> rank(distinct_.size());
+    int64_t next = 0;
+    for (size_t i = 0; i < order.size(); ++i) {
+      if (i > 0 && less(order[i - 1], order[i])) ++next;
+      rank[order[i]] = next;
     }
+    for (const RowText& r : rows_) set(r.row, rank[r.text]);
   }
 
  private:
-  struct Entry {
+  struct Distinct {
     uint64_t prefix;
-    uint32_t row, offset, length;
+    size_t hash;
+    uint32_t offset, length;
   };
-  std::vector<Entry, LargePageAllocator<Entry>> at_;
-  std::string buffer_;
+  struct RowText {
+    uint32_t row, text;  // the row and its text's place in distinct_
+  };
+
+  std::string_view View(const Distinct& d) const { return std::string_view(buffer_.data() + d.offset, d.length); }
+
+  // The place of a lower-cased text in distinct_, added when new.
+  uint32_t Find(std::string_view text, size_t hash) {
+    if (2 * (distinct_.size() + 1) > slots_.size()) Grow();
+    const size_t mask = slots_.size() - 1;
+    for (size_t at = hash & mask;; at = (at + 1) & mask) {
+      const uint32_t slot = slots_[at];
+      if (slot == 0) {
+        slots_[at] = Keep(text, hash) + 1;
+        return slots_[at] - 1;
+      }
+      const Distinct& d = distinct_[slot - 1];
+      if (d.hash == hash && View(d) == text) return slot - 1;
+    }
+  }
+  uint32_t Keep(std::string_view text, size_t hash) {
+    uint64_t prefix = 0;
+    for (size_t i = 0; i < 8; ++i) prefix = (prefix << 8) | (i < text.size() ? static_cast<unsigned char>(text[i]) : 0);
+    distinct_.push_back({prefix, hash, static_cast<uint32_t>(buffer_.size()), static_cast<uint32_t>(text.size())});
+    buffer_ += text;
+    return static_cast<uint32_t>(distinct_.size() - 1);
+  }
+  // Twice the room, the texts placed again (the table stays at most half
+  // full, so that a search ends soon).
+  void Grow() {
+    slots_.assign(std::max<size_t>(64, slots_.size() * 2), 0);
+    const size_t mask = slots_.size() - 1;
+    for (uint32_t d = 0; d < distinct_.size(); ++d) {
+      size_t at = distinct_[d].hash & mask;
+      while (slots_[at] != 0) at = (at + 1) & mask;
+      slots_[at] = d + 1;
+    }
+  }
+
+  std::vector<RowText, LargePageAllocator<RowText>> rows_;
+  std::vector<Distinct> distinct_;
+  std::string buffer_;           // the different texts, lower-cased
+  std::vector<uint32_t> slots_;  // hash table: a place in distinct_ + 1, 0 when empty
+  std::string lowered_;          // the text being added
 };
 
 // Below this many texts a key's ranking is done sooner than a thread is
 // started for it.
 constexpr size_t kTextsRankedAside = 8192;
-// Below this many records the keys are read sooner than a thread is
-// started for half of them.
+// Below this many records the keys are read, and the rows sorted, sooner
+// than a thread is started for half of them.
 constexpr size_t kRowsReadAside = 16384;
 
 // The values of slots 0 .. `last` of a record, found in one walk (nothing
@@ -395,9 +439,17 @@ bool SortKeyTable::Pack() {
 
 void SortKeyTable::Sort() {
   const long count = static_cast<long>(rows_.size());
+  // Both sorts only compare and swap the positions they are given.
+  const bool two = rows_.size() >= kRowsReadAside && std::thread::hardware_concurrency() > 1;
+  auto sort = [&](auto compare, auto swap) {
+    if (two) {
+      SortPositionsOnTwoThreads(count, compare, swap);
+    } else {
+      SortPositions(count, compare, swap);
+    }
+  };
   if (Pack()) {
-    SortPositions(
-        count,
+    sort(
         [this](long x, long y) {
           const uint64_t a = packed_[x].key, b = packed_[y].key;
           return (a > b) - (a < b);
@@ -405,9 +457,8 @@ void SortKeyTable::Sort() {
         [this](long x, long y) { std::swap(packed_[x], packed_[y]); });
     return;
   }
-  SortPositions(
-      count, [this](long x, long y) { return Compare(rows_[x], rows_[y]); },
-      [this](long x, long y) { std::swap(rows_[x], rows_[y]); });
+  sort([this](long x, long y) { return Compare(rows_[x], rows_[y]); },
+       [this](long x, long y) { std::swap(rows_[x], rows_[y]); });
 }
 
 }  // namespace cx

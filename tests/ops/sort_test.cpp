@@ -261,8 +261,9 @@ TEST(SortAllTest, SameOrderAsThePlainAlgorithm) {
   }
 }
 
-// Two keys of texts in a large table are ranked at the same time; the
-// order must still be the plain algorithm's.
+// Two keys of texts in a large table are ranked at the same time, and its
+// rows read and sorted on two threads; the order must still be the plain
+// algorithm's.
 TEST(SortAllTest, TwoTextKeysOfALargeTableGiveThePlainOrder) {
   std::mt19937 rng(99);
   TestDb t;
@@ -271,13 +272,15 @@ TEST(SortAllTest, TwoTextKeysOfALargeTableGiveThePlainOrder) {
   const int name = t.Field(FieldType::Text, "Name");
   const int owner = t.Field(FieldType::Linked, "Owner");
   const char* cities[] = {"Oslo", "oslo", "Bergen", "", "Ålesund", "Tromsø", "bergen, west"};
-  for (uint32_t i = 0; i < 12000; ++i) {
-    const std::string who = std::string(1 + rng() % 3, static_cast<char>('a' + rng() % 26)) + (rng() % 2 ? "X" : "x");
+  // Large enough to be read and sorted on two threads; names of many
+  // lengths, so that texts share their first eight bytes.
+  for (uint32_t i = 0; i < 20000; ++i) {
+    const std::string who = std::string(1 + rng() % 12, static_cast<char>('a' + rng() % 26)) + (rng() % 2 ? "X" : "x");
     t.db.AppendRecord(t.Build({Text(city, cities[rng() % 7]), Num(qty, rng() % 50), Text(name, who),
-                               Text(owner, who)}),
+                               Text(owner, rng() % 9 ? who : "")}),
                       0, i);
   }
-  for (auto keys : {std::array<int, 3>{city, name, qty}, std::array<int, 3>{name, owner, city}}) {
+  auto check = [&](std::array<int, 3> keys) {
     SetKeys(t.db, {{keys[0], 1}, {keys[1], 0}, {keys[2], 1}});
     Database plain = t.db;
     ReferenceSortAll(plain);
@@ -285,7 +288,14 @@ TEST(SortAllTest, TwoTextKeysOfALargeTableGiveThePlainOrder) {
     std::vector<uint32_t> expected;
     for (const DataRecord& r : plain.table()) expected.push_back(r.uniqueID());
     ASSERT_EQ(t.Ids(), expected);
+  };
+  check({city, name, qty});
+  check({name, owner, city});
+  // Records without some keys' slots: the rows are compared one by one.
+  for (size_t i = 0; i < t.db.recordCount(); i += 97) {
+    t.db.ReplaceRecord(i, CutBefore(Bytes(t.db.record(i).begin(), t.db.record(i).end()), qty));
   }
+  check({city, qty, name});
 }
 
 TEST(SortAllTest, FullSizeTableEndsSorted) {
@@ -347,6 +357,31 @@ TEST(SortAllTest, AdversarialArrangementStaysWithinNLogN) {
       ASSERT_LE(value[static_cast<size_t>(item[static_cast<size_t>(i - 1)])],
                 value[static_cast<size_t>(item[static_cast<size_t>(i)])])
           << "position " << i << " of " << n;
+    }
+  }
+}
+
+// Splitting the work after the first partition must not change a single
+// position, even for a comparison that is not a strict order (wrapped
+// differences of numbers far apart) and for ranges full of ties.
+TEST(SortAllTest, TwoThreadsGiveTheSameOrderAsOne) {
+  std::mt19937 rng(5);
+  for (const long n : {2L, 3L, 4L, 5L, 100L, 20011L}) {
+    for (int kind = 0; kind < 3; ++kind) {
+      std::vector<uint32_t> values(static_cast<size_t>(n));
+      for (auto& v : values) v = kind == 0 ? rng() : (kind == 1 ? rng() % 3 : rng() % 1000);
+      // Where each item ends up, not only the values: ties must land alike.
+      auto run = [&](auto sort) {
+        std::vector<size_t> item(values.size());
+        for (size_t i = 0; i < item.size(); ++i) item[i] = i;
+        auto value = [&](long at) { return values[item[static_cast<size_t>(at)]]; };
+        sort(n, [&](long x, long y) { return static_cast<int>(static_cast<int32_t>(value(x) - value(y))); },
+             [&](long x, long y) { std::swap(item[static_cast<size_t>(x)], item[static_cast<size_t>(y)]); });
+        return item;
+      };
+      auto one = run([](long count, auto compare, auto swap) { SortPositions(count, compare, swap); });
+      auto two = run([](long count, auto compare, auto swap) { SortPositionsOnTwoThreads(count, compare, swap); });
+      ASSERT_EQ(one, two) << n << " items, kind " << kind;
     }
   }
 }

@@ -1,9 +1,9 @@
 #include "ops/sort_keys.h"
 
 #include <algorithm>
-#include <functional>
 #include <array>
 #include <bit>
+#include <functional>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -384,9 +384,9 @@ bool SortKeyTable::Pack() {
   // puts it in unsigned order, then the offset from the smallest.
   std::array<uint64_t, 3> flip{}, low{}, span{};
   std::array<bool, 3> any{};
-  auto unsignedValue = [&](const Row& row, int k) {
+  auto unsignedValue = [&](const Row& row, int k, uint64_t flipped) {
     return (rule_[k] == Rule::Wrapped ? static_cast<uint32_t>(row.value[k].number)
-                                      : static_cast<uint64_t>(row.value[k].number)) ^ flip[k];
+                                      : static_cast<uint64_t>(row.value[k].number)) ^ flipped;
   };
   for (int k = 0; k < keys_; ++k) {
     if (rule_[k] == Rule::Real) return false;
@@ -400,8 +400,7 @@ bool SortKeyTable::Pack() {
       if (row.noData || row.state[k] == 0) return false;
       if (rule_[k] == Rule::Equal || row.state[k] == 2) continue;
       for (int f = 0; f < 2; ++f) {
-        flip[k] = flips[f];
-        const uint64_t v = unsignedValue(row, k);
+        const uint64_t v = unsignedValue(row, k, flips[f]);
         lo[f] = std::min(lo[f], v);
         hi[f] = std::max(hi[f], v);
       }
@@ -427,7 +426,7 @@ bool SortKeyTable::Pack() {
     for (int k = 0; k < keys_; ++k) {
       uint64_t part = 0;
       if (any[k] && rule_[k] != Rule::Equal && row.state[k] != 2) {
-        part = unsignedValue(row, k) - low[k] + (rule_[k] == Rule::LinkedRank ? 1 : 0);
+        part = unsignedValue(row, k, flip[k]) - low[k] + (rule_[k] == Rule::LinkedRank ? 1 : 0);
       }
       if (reverse_[k]) part = span[k] - part;
       key = width[k] == 64 ? part : (key << width[k]) | part;

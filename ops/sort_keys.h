@@ -37,8 +37,9 @@ class SortKeyTable {
   Rows& rows() { return rows_; }
   int Compare(const Row& a, const Row& b) const;
 
-  // Puts the records in order with SortPositions; RecordAt(position) then
-  // names the record at each position.
+  // Puts the records in the order SortPositions gives them (a large table
+  // on two threads); RecordAt(position) then names the record at each
+  // position.
   void Sort();
   uint32_t RecordAt(size_t position) const {
     return packed_.empty() ? rows_[position].record : packed_[position].record;

@@ -71,11 +71,13 @@ namespace {
 bool OpenLocked(Context& ctx, const std::string& given, DataSession& session, FileLock::Kind kind) {
   const std::string path = LocateDatabase(given);
   if (!LockDatabases(ctx, {path}, kind)) return false;
-  if (!CheckOpenAccess(path, ctx.ui)) return false;
   // The command ends within moments and holds the file's lock meanwhile, so
   // the file's own cached pages can serve as its image; main() turns the
-  // fault of a file cut short by another program into an error.
-  return OpenDatabase(session, path, FileBuffer::Access::kMap).ok();
+  // fault of a file cut short by another program into an error. Its
+  // protection is checked on the schema before any record is read.
+  return OpenDatabase(session, path, FileBuffer::Access::kMap,
+                      [&ctx](const Schema& schema) { return CheckOpenAccess(schema, ctx.ui); })
+      .ok();
 }
 
 }  // namespace

@@ -259,6 +259,10 @@ Database Database::CreateNew(const std::string& path, const std::string& name) {
 }
 
 Status Database::Open(const std::string& path, UiPort& ui, FileBuffer::Access access) {
+  return Open(path, ui, access, {});
+}
+
+Status Database::Open(const std::string& path, UiPort& ui, FileBuffer::Access access, const Admission& admit) {
   auto image = std::make_shared<FileBuffer>();
   if (!image->Read(path, access)) {
     const std::string message = FormatMessage(messages::kCannotOpen, path);
@@ -268,7 +272,7 @@ Status Database::Open(const std::string& path, UiPort& ui, FileBuffer::Access ac
   }
   const ByteView bytes(image->data(), image->size());
   const auto state = image->state();
-  Status status = Load(path, RecordSource{std::move(image), bytes}, ui);
+  Status status = Load(path, RecordSource{std::move(image), bytes}, ui, admit);
   // Remembered so that a save can tell whether someone else changed the file.
   if (status) diskState_ = state;
   return status;
@@ -279,7 +283,7 @@ Status Database::OpenBytes(const std::string& path, std::shared_ptr<const Bytes>
   return Load(path, RecordSource{std::move(bytes), view}, ui);
 }
 
-Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) {
+Status Database::Load(const std::string& path, RecordSource source, UiPort& ui, const Admission& admit) {
   auto fail = [&ui](std::string message) {
     ui.SetBusy(false);
     ui.ShowMessage(message, "Error", MessageIcon::Error);
@@ -292,6 +296,7 @@ Status Database::Load(const std::string& path, RecordSource source, UiPort& ui) 
   if (Status status = ReadHead(reader, std::move(source), head); !status) {
     return fail(status.message());
   }
+  if (admit && !admit(head.schema)) return Status::Error("The database was not opened: access was refused");
   Database db;
   db.path_ = path;
   db.header_ = head.header;

@@ -5,6 +5,7 @@
 #include <array>
 #include <atomic>
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -139,6 +140,12 @@ class Database {
   // succeeds with the records before it; partial() then tells, and Save()
   // will not overwrite the original file.
   Status Open(const std::string& path, UiPort& ui, FileBuffer::Access access = FileBuffer::Access::kCopy);
+  // Says from a file's schema whether it may be opened at all (its
+  // protection), having told the user why not when it says no.
+  using Admission = std::function<bool(const Schema&)>;
+  // Open() that asks `admit` once the schema is read, before any record is:
+  // one reading of the file serves both.
+  Status Open(const std::string& path, UiPort& ui, FileBuffer::Access access, const Admission& admit);
   // The same open of a file's bytes already in memory (a database that
   // arrived from outside and is not stored yet), named `path`.
   Status OpenBytes(const std::string& path, std::shared_ptr<const Bytes> bytes, UiPort& ui);
@@ -213,7 +220,7 @@ class Database {
   std::string Name() const { return header_.Name(); }
 
  private:
-  Status Load(const std::string& path, RecordSource source, UiPort& ui);
+  Status Load(const std::string& path, RecordSource source, UiPort& ui, const Admission& admit = {});
   Status Write(const std::string& target, const Clock& clock, const RecordsReady* ready);
   // The header and entry list for the records as they are now; false when
   // the file would be too large.

@@ -27,8 +27,9 @@ PendingWork RunPendingWork(DataSession& session) {
   return PendingWork::None;
 }
 
-Status OpenDatabase(DataSession& session, const std::string& path, FileBuffer::Access access) {
-  Status status = session.db.Open(path, session.ui, access);
+Status OpenDatabase(DataSession& session, const std::string& path, FileBuffer::Access access,
+                    const Database::Admission& admit) {
+  Status status = session.db.Open(path, session.ui, access, admit);
   if (!status) return status;
   session.calc = RecalcState{};
   session.found = FindHit{};

@@ -23,8 +23,10 @@ PendingWork RunPendingWork(DataSession& session);
 
 // OpenDatabase: Database::Open of `path` into the session's database
 // (messages through the session's port), then RunPendingWork and the view.
-// On failure the database is unchanged. `access` as FileBuffer::Read.
+// On failure the database is unchanged. `access` as FileBuffer::Read;
+// `admit`, when given, as Database::Open takes it.
 Status OpenDatabase(DataSession& session, const std::string& path,
-                    FileBuffer::Access access = FileBuffer::Access::kCopy);
+                    FileBuffer::Access access = FileBuffer::Access::kCopy,
+                    const Database::Admission& admit = {});
 
 }  // namespace cx

@@ -1,5 +1,7 @@
 #include "ops/text_encoding.h"
 
+#include <algorithm>
+
 #include <array>
 #include <cctype>
 #include <cstdint>
@@ -77,10 +79,13 @@ NarrowedText NarrowText(std::string_view text, TextEncoding encoding) {
   while (i < text.size()) {
     const unsigned char c = static_cast<unsigned char>(text[i]);
     if (c < 0x80) {
-      // Most of a CSV file is ASCII; it passes through without decoding.
-      result.bytes += static_cast<char>(c);
-      if (c == '\n') ++line;
-      ++i;
+      // Most of a CSV file is ASCII: it passes through a run at a time,
+      // without decoding.
+      const size_t end = FirstHighByte(text, i);
+      const std::string_view run = text.substr(i, end - i);
+      result.bytes += run;
+      line += static_cast<size_t>(std::count(run.begin(), run.end(), '\n'));
+      i = end;
       continue;
     }
     const size_t start = i;

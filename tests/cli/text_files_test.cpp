@@ -195,6 +195,17 @@ TEST(NarrowText, KeepsWhatFitsAndCountsLinesAtLineFeeds) {
     }
     EXPECT_EQ(pieces.text, Cp1252ToUtf8(mixed)) << "pieces of " << piece;
   }
+  // Narrowing skips the same runs: lines keep their count across them.
+  std::string lines, narrowed;
+  for (int gap = 0; gap < 40; ++gap) {
+    lines += std::string(static_cast<size_t>(gap), 'a') + "\n\xE2\x88\x9E";  // infinity: cannot be stored
+    narrowed += std::string(static_cast<size_t>(gap), 'a') + "\n?";
+  }
+  t = NarrowText(Cp1252ToUtf8(mixed) + lines, TextEncoding::kUtf8);
+  EXPECT_EQ(t.bytes, mixed + narrowed);
+  EXPECT_EQ(t.unstorableLines, 40u);
+  ASSERT_EQ(t.first.size(), NarrowedText::kKeptLines);
+  for (size_t k = 0; k < t.first.size(); ++k) EXPECT_EQ(t.first[k].line, k + 2);
 }
 
 }  // namespace

@@ -67,56 +67,68 @@ std::optional<TextEncoding> ParseTextEncoding(std::string_view name) {
 }
 
 NarrowedText NarrowText(std::string_view text, TextEncoding encoding) {
+  return NarrowTextInPlace(std::string(text), encoding);
+}
+
+NarrowedText NarrowTextInPlace(std::string&& bytes, TextEncoding encoding) {
   NarrowedText result;
   if (encoding == TextEncoding::kWindows1252) {
-    result.bytes.assign(text);
+    result.bytes = std::move(bytes);
     return result;
   }
-  if (text.substr(0, 3) == "\xEF\xBB\xBF") text.remove_prefix(3);
-  result.bytes.reserve(text.size());
+  // Narrowed where it lies: a character never takes more bytes in the
+  // code page than in UTF-8, so what is written never overtakes what is
+  // still to be read.
+  std::string& text = bytes;
+  const std::string_view all(text);
+  size_t in = all.substr(0, 3) == "\xEF\xBB\xBF" ? 3 : 0;
+  size_t out = 0;
   size_t line = 1, lastCounted = 0;
-  size_t i = 0;
-  while (i < text.size()) {
-    const unsigned char c = static_cast<unsigned char>(text[i]);
+  while (in < text.size()) {
+    const unsigned char c = static_cast<unsigned char>(text[in]);
     if (c < 0x80) {
       // Most of a CSV file is ASCII: it passes through a run at a time,
       // without decoding.
-      const size_t end = FirstHighByte(text, i);
-      const std::string_view run = text.substr(i, end - i);
-      result.bytes += run;
-      line += static_cast<size_t>(std::count(run.begin(), run.end(), '\n'));
-      i = end;
+      const size_t end = FirstHighByte(all, in);
+      line += static_cast<size_t>(std::count(all.begin() + static_cast<std::ptrdiff_t>(in),
+                                             all.begin() + static_cast<std::ptrdiff_t>(end), '\n'));
+      if (out != in) std::memmove(text.data() + out, text.data() + in, end - in);
+      out += end - in;
+      in = end;
       continue;
     }
-    const size_t start = i;
-    const char32_t cp = NextCodePoint(text, i);
-    std::string_view sequence = text.substr(start, i - start);
+    const size_t start = in;
+    const char32_t cp = NextCodePoint(all, in);
+    const std::string_view sequence = all.substr(start, in - start);
     const bool malformed = cp == U'\uFFFD' && sequence != "\xEF\xBF\xBD";
     bool lossless = false;
     std::string narrow;
     if (!malformed) narrow = Utf8ToCp1252(sequence, &lossless);
-    if (lossless) {
-      result.bytes += narrow;
-      continue;
-    }
-    result.bytes += '?';
-    if (lastCounted != line) {
-      ++result.unstorableLines;
-      lastCounted = line;
-    }
-    if (result.unstorableLines <= NarrowedText::kKeptLines) {
-      UnstorableCharacter u;
-      u.line = line;
-      if (malformed) {
-        char hex[8];
-        std::snprintf(hex, sizeof hex, "\\x%02X", static_cast<unsigned>(c));
-        u.character = hex;
-      } else {
-        u.character.assign(sequence);
+    if (!lossless) {
+      if (lastCounted != line) {
+        ++result.unstorableLines;
+        lastCounted = line;
       }
-      result.first.push_back(std::move(u));
+      if (result.unstorableLines <= NarrowedText::kKeptLines) {
+        UnstorableCharacter u;
+        u.line = line;
+        if (malformed) {
+          char hex[8];
+          std::snprintf(hex, sizeof hex, "\\x%02X", static_cast<unsigned>(c));
+          u.character = hex;
+        } else {
+          u.character.assign(sequence);
+        }
+        result.first.push_back(std::move(u));
+      }
+      narrow = "?";
     }
+    // Only now that the sequence has been read may its place be written.
+    std::memcpy(text.data() + out, narrow.data(), narrow.size());
+    out += narrow.size();
   }
+  text.resize(out);
+  result.bytes = std::move(text);
   return result;
 }
 

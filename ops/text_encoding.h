@@ -38,6 +38,9 @@ struct NarrowedText {
 // byte-order mark is dropped: editors on some systems begin files with
 // one. Lines are counted at LF, so a CR LF file counts as its editor shows.
 NarrowedText NarrowText(std::string_view text, TextEncoding encoding);
+// The same, narrowing the bytes where they lie (no second copy of a large
+// file).
+NarrowedText NarrowTextInPlace(std::string&& bytes, TextEncoding encoding);
 
 // One line per kept character, as `line 3: "Ω" cannot be stored`.
 std::vector<std::string> DescribeUnstorable(const NarrowedText& text);

@@ -61,8 +61,7 @@ class ImportCsvCommand : public Command {
     } else {
       std::string bytes;
       if (Status s = ReadTextFrom(in, bytes); !s) return Failure(ctx, s.message());
-      NarrowedText text = NarrowText(bytes, encoding);
-      bytes = std::string();
+      NarrowedText text = NarrowTextInPlace(std::move(bytes), encoding);
       if (!text.lossless()) return RefuseUnstorable(ctx, in, text);
       result = ImportCsvText(db, std::move(text.bytes), TextFileName(in), mode, CsvSettings(),
                              ctx.locale, strict, header);

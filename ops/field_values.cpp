@@ -75,10 +75,10 @@ double ParseDouble(std::string_view text) {
   return negative ? -value : value;
 }
 
-SlotValues AllSlotValues(ByteView record) {
+SlotValues AllSlotValues(ByteView record, int last) {
   SlotValues values;
   size_t off = DataStart(record);
-  for (int i = 0; i < format::kFieldCount; ++i) {
+  for (int i = 0; i <= last && i < format::kFieldCount; ++i) {
     if (off + 2 > record.size()) break;
     const size_t len = GetLE16(record.data() + off);
     if (len == format::kEndMark) break;

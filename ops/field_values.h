@@ -38,7 +38,8 @@ double ParseDouble(std::string_view text);
 // The value of every slot of a record, found in one walk: entry i is what
 // FieldValue(record, i) gives.
 using SlotValues = std::array<std::optional<ByteView>, format::kFieldCount>;
-SlotValues AllSlotValues(ByteView record);
+// Slots after `last` are left without a value, unread.
+SlotValues AllSlotValues(ByteView record, int last = format::kFieldCount - 1);
 
 // The text of a value up to its NUL (or the end of the value).
 std::string_view ValueView(ByteView value);

@@ -9,7 +9,6 @@
 #include <string_view>
 #include <thread>
 
-#include "engine/byte_order.h"
 #include "ops/database_settings.h"
 #include "ops/field_values.h"
 #include "ops/position_sort.h"
@@ -128,23 +127,6 @@ constexpr size_t kTextsRankedAside = 8192;
 // Below this many records the keys are read, and the rows sorted, sooner
 // than a thread is started for half of them.
 constexpr size_t kRowsReadAside = 16384;
-
-// The values of slots 0 .. `last` of a record, found in one walk (nothing
-// for a slot past the record's end).
-void SlotValuesUpTo(ByteView record, int last,
-                    std::array<std::optional<ByteView>, format::kFieldCount>& values) {
-  size_t off = DataStart(record);
-  int slot = 0;
-  for (; slot <= last; ++slot) {
-    if (off + 2 > record.size()) break;
-    const size_t len = GetLE16(record.data() + off);
-    if (len == format::kEndMark) break;
-    const size_t at = off + 2;
-    values[slot] = record.subspan(at, std::min(len, record.size() - at));
-    off = at + len;
-  }
-  for (; slot <= last; ++slot) values[slot] = std::nullopt;
-}
 
 }  // namespace
 
@@ -292,13 +274,12 @@ SortKeyTable::SortKeyTable(const Database& db) {
     if (reader.field() < format::kFieldCount) lastSlot = std::max(lastSlot, reader.field());
   }
   auto readRows = [&](size_t from, size_t to, std::array<TextRanks*, 3> texts) {
-    std::array<std::optional<ByteView>, format::kFieldCount> values;
     for (size_t i = from; i < to; ++i) {
       Row& row = rows_[i];
       const ByteView record = db.record(i);
       row.record = static_cast<uint32_t>(i);
       row.noData = record.empty();
-      SlotValuesUpTo(record, lastSlot, values);
+      const SlotValues values = AllSlotValues(record, lastSlot);
       for (int k = 0; k < keys_; ++k) {
         const int field = readers[k].field();
         if (field >= 0 && field < format::kFieldCount && values[field]) {

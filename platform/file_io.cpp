@@ -369,6 +369,28 @@ Status SafeFileWriter::Open() {
   return Status::Ok();
 }
 
+namespace {
+
+// All of p[0, size) at the file's position, or at `at` when that is not
+// negative, through interruptions and partial writes; false with the reason
+// in `error` when the system refuses.
+bool WriteFully(int fd, const uint8_t* p, size_t size, int64_t at, std::string& error) {
+  size_t done = 0;
+  while (done < size) {
+    const ssize_t n = at < 0 ? ::write(fd, p + done, size - done)
+                             : ::pwrite(fd, p + done, size - done, static_cast<off_t>(at) + static_cast<off_t>(done));
+    if (n < 0 && errno == EINTR) continue;
+    if (n <= 0) {
+      error = n < 0 ? ErrnoText() : "short write";
+      return false;
+    }
+    done += static_cast<size_t>(n);
+  }
+  return true;
+}
+
+}  // namespace
+
 bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
   // A file that will be flushed starts on its way to the disk while the
   // rest is still being written, so that the flush at the end waits for
@@ -381,15 +403,12 @@ bool SafeFileWriter::WriteAll(const uint8_t* p, size_t size) {
   size_t done = 0;
   while (done < size) {
     const size_t step = sendOn ? std::min<size_t>(size - done, kWriteBackStep) : size - done;
-    ssize_t n = ::write(fd_, p + done, step);
-    if (n < 0 && errno == EINTR) continue;
-    if (n <= 0) {
+    if (!WriteFully(fd_, p + done, step, -1, error_)) {
       failed_ = true;
-      error_ = n < 0 ? ErrnoText() : "short write";
       return false;
     }
-    done += static_cast<size_t>(n);
-    writtenBytes_ += static_cast<uint64_t>(n);
+    done += step;
+    writtenBytes_ += step;
 #if defined(__linux__)
     if (sendOn && writtenBytes_ - startedBytes_ >= kWriteBackStep) {
       ::sync_file_range(fd_, static_cast<off64_t>(startedBytes_),
@@ -440,17 +459,9 @@ bool SafeFileWriter::SkipTo(uint64_t offset) {
 
 bool SafeFileWriter::WriteAt(uint64_t offset, const void* data, size_t size) {
   if (failed_ || fd_ < 0 || !Flush()) return false;
-  const uint8_t* p = static_cast<const uint8_t*>(data);
-  size_t done = 0;
-  while (done < size) {
-    ssize_t n = ::pwrite(fd_, p + done, size - done, static_cast<off_t>(offset + done));
-    if (n < 0 && errno == EINTR) continue;
-    if (n <= 0) {
-      failed_ = true;
-      error_ = n < 0 ? ErrnoText() : "short write";
-      return false;
-    }
-    done += static_cast<size_t>(n);
+  if (!WriteFully(fd_, static_cast<const uint8_t*>(data), size, static_cast<int64_t>(offset), error_)) {
+    failed_ = true;
+    return false;
   }
   return true;
 }

@@ -9,6 +9,7 @@
 #include "engine/byte_order.h"
 #include "platform/file_io.h"
 #include "platform/large_block.h"
+#include "platform/run_beside.h"
 
 namespace cx {
 
@@ -243,10 +244,9 @@ size_t CountMalformed(const RecordTable& records) {
   if (count < kRecordsCheckedInTwo || std::thread::hardware_concurrency() < 2) {
     return CountMalformedIn(records, 0, count);
   }
-  size_t second = 0;
-  std::thread helper([&] { second = CountMalformedIn(records, count / 2, count); });
-  const size_t first = CountMalformedIn(records, 0, count / 2);
-  helper.join();
+  size_t first = 0, second = 0;
+  RunBeside([&] { second = CountMalformedIn(records, count / 2, count); },
+            [&] { first = CountMalformedIn(records, 0, count / 2); });
   return first + second;
 }
 

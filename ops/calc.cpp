@@ -2,14 +2,13 @@
 
 #include <algorithm>
 #include <array>
-#include <system_error>
-#include <thread>
 #include <vector>
 
 #include "engine/byte_order.h"
 #include "engine/value_text.h"
 #include "ops/field_values.h"
 #include "ops/sort.h"
+#include "platform/run_beside.h"
 
 namespace cx {
 namespace {
@@ -412,19 +411,15 @@ Status RecalculateWhileSaving(DataSession& session, const std::function<void()>&
                               const Clock& clock) {
   RecordsReady ready;
   Status saved;
-  std::thread saver;
-  try {
-    saver = std::thread([&] { saved = session.db.SaveAlong(ready, clock); });
-  } catch (const std::system_error&) {
-    // No second thread to be had: one step after the other.
-    recalculate();
-    return session.db.Save(clock);
-  }
-  session.savingAlong = &ready;
-  recalculate();
-  session.savingAlong = nullptr;
-  ready.Finish();
-  saver.join();
+  // Without a second thread the save comes after the recalculation, which
+  // has then told it everything is final.
+  RunBeside([&] { saved = session.db.SaveAlong(ready, clock); },
+            [&] {
+              session.savingAlong = &ready;
+              recalculate();
+              session.savingAlong = nullptr;
+              ready.Finish();
+            });
   return saved;
 }
 

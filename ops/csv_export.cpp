@@ -15,6 +15,7 @@
 #endif
 
 #include "engine/value_text.h"
+#include "platform/run_beside.h"
 
 namespace cx {
 namespace {
@@ -132,7 +133,9 @@ bool FormatInTwoThreads(const std::vector<uint32_t>& indexes, const Database& db
     return true;
   };
 
-  std::thread helper([&] {
+  // The second thread formats groups ahead; without one, this thread
+  // formats every group itself and the other finds none left.
+  auto helper = [&] {
     std::unique_lock<std::mutex> lock(mutex);
     size_t g = 0;
     while (take(lock, g)) {
@@ -142,31 +145,33 @@ bool FormatInTwoThreads(const std::vector<uint32_t>& indexes, const Database& db
       slots[g % kInFlight].ready = true;
       changed.notify_all();
     }
-  });
-  std::unique_lock<std::mutex> lock(mutex);
-  while (written < groups) {
-    Group& due = slots[written % kInFlight];
-    size_t g = 0;
-    if (!due.ready && next < groups && next < written + kInFlight) {
-      take(lock, g);
+  };
+  auto writer = [&] {
+    std::unique_lock<std::mutex> lock(mutex);
+    while (written < groups) {
+      Group& due = slots[written % kInFlight];
+      size_t g = 0;
+      if (!due.ready && next < groups && next < written + kInFlight) {
+        take(lock, g);
+        lock.unlock();
+        format(g);
+        lock.lock();
+        slots[g % kInFlight].ready = true;
+        changed.notify_all();
+        continue;
+      }
+      changed.wait(lock, [&] { return due.ready; });
       lock.unlock();
-      format(g);
+      for (uint32_t index : due.empty) reportEmpty(index);
+      if (!due.lines.empty() && !out.Write(due.lines)) ok = false;
       lock.lock();
-      slots[g % kInFlight].ready = true;
+      due.ready = false;
+      ++written;
       changed.notify_all();
-      continue;
     }
-    changed.wait(lock, [&] { return due.ready; });
     lock.unlock();
-    for (uint32_t index : due.empty) reportEmpty(index);
-    if (!due.lines.empty() && !out.Write(due.lines)) ok = false;
-    lock.lock();
-    due.ready = false;
-    ++written;
-    changed.notify_all();
-  }
-  lock.unlock();
-  helper.join();
+  };
+  RunBeside(helper, writer);
   return ok;
 }
 

@@ -5,7 +5,8 @@
 
 #include <array>
 #include <cstddef>
-#include <thread>
+
+#include "platform/run_beside.h"
 
 namespace cx {
 
@@ -139,9 +140,8 @@ void SortPositionsOnTwoThreads(long count, Compare compare, Swap swap) {
   }
   long i = 0, j = 0;
   detail::Split(0, count - 1, compare, swap, j, i);
-  std::thread left([&] { detail::SortRange(0, j, 1, budget, compare, swap); });
-  detail::SortRange(i + 1, count - 1, 1, budget, compare, swap);
-  left.join();
+  RunBeside([&] { detail::SortRange(0, j, 1, budget, compare, swap); },
+            [&] { detail::SortRange(i + 1, count - 1, 1, budget, compare, swap); });
 }
 
 }  // namespace cx

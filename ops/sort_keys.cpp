@@ -12,6 +12,7 @@
 #include "ops/database_settings.h"
 #include "ops/field_values.h"
 #include "ops/position_sort.h"
+#include "platform/run_beside.h"
 
 namespace cx {
 namespace {
@@ -294,9 +295,7 @@ SortKeyTable::SortKeyTable(const Database& db) {
     std::array<TextRanks, 3> later;
     std::array<TextRanks*, 3> laterTexts{&later[0], &later[1], &later[2]};
     const size_t half = count / 2;
-    std::thread second([&] { readRows(half, count, laterTexts); });
-    readRows(0, half, own);
-    second.join();
+    RunBeside([&] { readRows(half, count, laterTexts); }, [&] { readRows(0, half, own); });
     for (int k = 0; k < keys_; ++k) own[k]->Append(later[k]);
   } else {
     readRows(0, count, own);
@@ -311,14 +310,17 @@ SortKeyTable::SortKeyTable(const Database& db) {
       if (readers[other].texts() >= kTextsRankedAside) aside = k;
     }
   }
-  std::thread helper;
-  if (aside >= 0 && std::thread::hardware_concurrency() > 1) {
-    helper = std::thread([&readers, aside, this] { readers[aside].Finish(aside, rows_); });
+  if (aside < 0 || std::thread::hardware_concurrency() < 2) aside = -1;
+  auto others = [&] {
+    for (int k = 0; k < keys_; ++k) {
+      if (k != aside) readers[k].Finish(k, rows_);
+    }
+  };
+  if (aside < 0) {
+    others();
+  } else {
+    RunBeside([&] { readers[aside].Finish(aside, rows_); }, others);
   }
-  for (int k = 0; k < keys_; ++k) {
-    if (k != aside || !helper.joinable()) readers[k].Finish(k, rows_);
-  }
-  if (helper.joinable()) helper.join();
 }
 
 int SortKeyTable::Compare(const Row& rowA, const Row& rowB) const {

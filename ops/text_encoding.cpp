@@ -1,7 +1,6 @@
 #include "ops/text_encoding.h"
 
 #include <algorithm>
-
 #include <array>
 #include <cctype>
 #include <cstdint>

@@ -32,7 +32,9 @@ std::vector<std::unique_ptr<Command>> Registry::All() const {
 std::string Command::help() const {
   Syntax syntax(name());
   Declare(syntax);
-  return syntax.Help(&GlobalSyntax());
+  Syntax globals;
+  DeclareGlobalOptions(globals);
+  return syntax.Help(&globals);
 }
 
 int UsageError(Context& ctx, const Command& command, const std::string& message) {

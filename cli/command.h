@@ -49,8 +49,9 @@ class Command {
   virtual int Run(Context& ctx, const Arguments& args) = 0;
 };
 
-// The global options (global_options.cpp).
-const Syntax& GlobalSyntax();
+// Declares the global options (global_options.cpp). Each use takes a
+// declaration of its own: parsing keeps what it found in the declaration.
+void DeclareGlobalOptions(Syntax& syntax);
 
 using CommandFactory = std::function<std::unique_ptr<Command>()>;
 

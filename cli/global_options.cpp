@@ -7,6 +7,7 @@
 #include <optional>
 #include <ostream>
 #include <sstream>
+#include <tuple>
 
 #include "cli/argument_text.h"
 #include "cli/command.h"
@@ -43,9 +44,7 @@ std::optional<std::string> ReadPasswordLine(const std::string& file) {
 
 }  // namespace
 
-namespace {
-
-void DeclareGlobals(Syntax& s) {
+void DeclareGlobalOptions(Syntax& s) {
   s.Option("--date-format", "PATTERN",
              "short date pattern in the handheld's tokens, e.g. M/d/yyyy, dd.MMM.yy "
              "(M/MM/MMM month as a number, d/dd day, yy/yyyy year)",
@@ -81,15 +80,6 @@ void DeclareGlobals(Syntax& s) {
         .Flag("-V,--version", "the program's version");
 }
 
-}  // namespace
-
-const Syntax& GlobalSyntax() {
-  static Syntax syntax;
-  static const bool declared = (DeclareGlobals(syntax), true);
-  (void)declared;
-  return syntax;
-}
-
 std::string GeneralHelp() {
   std::ostringstream s;
   s << "Usage: cardovex-cli [global options] COMMAND [arguments]\n\n"
@@ -99,8 +89,10 @@ std::string GeneralHelp() {
     s << "  " << name << std::string(name.size() < 16 ? 16 - name.size() : 1, ' ') << c->summary()
       << "\n";
   }
+  Syntax globals;
+  DeclareGlobalOptions(globals);
   s << "\nGlobal options (before or after the command):\n"
-    << GlobalSyntax().OptionList()
+    << globals.OptionList()
     << "\nExit codes: 0 success, 1 the operation failed (the message is on stderr),\n"
        "2 usage error.\n"
     << "\n'cardovex-cli --help COMMAND' shows a command's arguments.\n";
@@ -119,10 +111,12 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
   // The global options are taken wherever they stand before "--"; the rest
   // (the command's name, its arguments, "--" and what follows it) keeps
   // its order for the command's own parser.
+  Syntax globals;
+  DeclareGlobalOptions(globals);
   Arguments global;
   std::vector<std::string> rest;
   std::string problem;
-  if (!GlobalSyntax().ParseKnown(args, global, rest, problem)) {
+  if (!globals.ParseKnown(args, global, rest, problem)) {
     err << "cardovex-cli: " << problem << "\n";
     return kExitUsage;
   }
@@ -148,7 +142,9 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
     }
     locale.decimalSeparator = (*v)[0];
   }
-  for (const char* option : {"--date-sep", "--time-sep"}) {
+  // An empty separator stands for the usual one.
+  for (auto [option, into, usual] : {std::tuple{"--date-sep", &locale.dateSeparator, '/'},
+                                     std::tuple{"--time-sep", &locale.timeSeparator, ':'}}) {
     std::optional<std::string> sep = global.value(option);
     if (!sep) continue;
     const std::string c = Utf8ToCp1252(*sep);
@@ -156,8 +152,7 @@ static int RunCommandLine(const std::vector<std::string>& args, std::ostream& ou
       err << "cardovex-cli: a separator is one character\n";
       return kExitUsage;
     }
-    char& into = option == std::string("--date-sep") ? locale.dateSeparator : locale.timeSeparator;
-    into = c.empty() ? (option == std::string("--date-sep") ? '/' : ':') : c[0];
+    *into = c.empty() ? usual : c[0];
   }
   if (global.has("--password") && global.has("--password-file")) {
     err << "cardovex-cli: --password and --password-file exclude each other\n";

@@ -90,7 +90,9 @@ std::string ManPage(const std::string& version) {
 
 
 std::string BashCompletion() {
-  const Options global = DeclaredOptions(GlobalSyntax());
+  Syntax globals;
+  DeclareGlobalOptions(globals);
+  const Options global = DeclaredOptions(globals);
   std::vector<std::string> names;
   std::ostringstream cases;
   std::vector<std::string> withValue = global.withValue;

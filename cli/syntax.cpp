@@ -103,26 +103,6 @@ std::vector<std::string> SplitNames(const std::string& names) {
 
 }  // namespace
 
-// CLI11's help is made here, in the layout the tool has always printed:
-// usage lines, prose, aligned option lines, notes.
-class HelpFormatter : public CLI::Formatter {
- public:
-  explicit HelpFormatter(const Syntax& syntax) : syntax_(syntax) {}
-  void SetGlobals(const Syntax* globals) { globals_ = globals; }
-
-  std::string make_help(const CLI::App*, std::string, CLI::AppFormatMode) const override {
-    std::string out = syntax_.Usage(globals_);
-    out += syntax_.about();
-    out += syntax_.OptionList();
-    out += syntax_.notes();
-    return out;
-  }
-
- private:
-  const Syntax& syntax_;
-  const Syntax* globals_ = nullptr;
-};
-
 std::optional<std::string> Arguments::value(const std::string& option) const {
   const auto& all = values(option);
   if (all.empty()) return std::nullopt;
@@ -135,9 +115,7 @@ const std::vector<std::string>& Arguments::values(const std::string& option) con
   return it->second;
 }
 
-Syntax::Syntax(std::string command) : command_(std::move(command)), app_(std::make_unique<Parser>()) {
-  app_->formatter(std::make_shared<HelpFormatter>(*this));
-}
+Syntax::Syntax(std::string command) : command_(std::move(command)), app_(std::make_unique<Parser>()) {}
 
 Syntax::~Syntax() = default;
 
@@ -181,11 +159,11 @@ Syntax& Syntax::Globals(std::vector<std::string> words) {
   return *this;
 }
 
-const Syntax::OptionInfo* Syntax::Find(const std::string& name) const {
+const Syntax::OptionInfo* Syntax::Find(const std::string& name, const Syntax* globals) const {
   for (const OptionInfo& o : options_) {
     if (std::find(o.names.begin(), o.names.end(), name) != o.names.end()) return &o;
   }
-  return nullptr;
+  return globals ? globals->Find(name, nullptr) : nullptr;
 }
 
 bool Syntax::Parse(const std::vector<std::string>& words, Arguments& out, std::string& error) const {
@@ -307,8 +285,7 @@ std::string Syntax::Word(const std::string& word, const Syntax* globals) const {
   const bool required = word.size() > 2 && word.front() == '(' && word.back() == ')';
   const std::string inner = required ? word.substr(1, word.size() - 2) : word;
   auto bare = [&](const std::string& name) -> std::string {
-    const OptionInfo* o = Find(name);
-    if (!o && globals) o = globals->Find(name);
+    const OptionInfo* o = Find(name, globals);
     if (!o) throw std::logic_error("the usage of " + command_ + " names an undeclared option " + name);
     return name + (o->value.empty() ? "" : " " + o->value);
   };
@@ -328,8 +305,7 @@ std::string Syntax::Word(const std::string& word, const Syntax* globals) const {
     }
     return required ? text : "[" + text + "]";
   }
-  const OptionInfo* o = Find(inner);
-  if (!o && globals) o = globals->Find(inner);
+  const OptionInfo* o = Find(inner, globals);
   if (required || (o && o->take == Take::kRequired)) return bare(inner);
   return "[" + bare(inner) + "]" + (o && o->take == Take::kRepeatable && !o->value.empty() ? "..." : "");
 }
@@ -387,9 +363,7 @@ std::string Syntax::OptionList() const {
 }
 
 std::string Syntax::Help(const Syntax* globals) const {
-  auto formatter = std::static_pointer_cast<HelpFormatter>(app_->get_formatter());
-  formatter->SetGlobals(globals);
-  return app_->help();
+  return Usage(globals) + about_ + OptionList() + notes_;
 }
 
 }  // namespace cx::cli

@@ -89,8 +89,8 @@ class Syntax {
   bool ParseKnown(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>& rest,
                   std::string& error) const;
 
-  // The command's help, made by CLI11 through our formatter; `globals` renders the
-  // global options named by Globals().
+  // The command's help: usage lines, prose, option lines, notes; `globals`
+  // renders the global options named by Globals().
   std::string Help(const Syntax* globals) const;
   // "  --name VALUE  description" lines for every option.
   std::string OptionList() const;
@@ -106,15 +106,14 @@ class Syntax {
     Take take;
   };
   const std::vector<OptionInfo>& options() const { return options_; }
-  const std::string& about() const { return about_; }
-  const std::string& notes() const { return notes_; }
 
  private:
   struct PositionalInfo {
     std::string name;
     Count count;
   };
-  const OptionInfo* Find(const std::string& name) const;
+  // The option of that name, declared here or else among `globals`.
+  const OptionInfo* Find(const std::string& name, const Syntax* globals) const;
   std::string Word(const std::string& word, const Syntax* globals) const;
   bool ParseWords(const std::vector<std::string>& words, Arguments& out, std::vector<std::string>* rest,
                   std::string& error) const;

@@ -158,7 +158,9 @@ TEST(CliManual, HelpPageAndCompletionListWhatIsDeclared) {
     EXPECT_NE(completion.find("    " + command->name() + ") opts='" + words + "' ;;\n"), std::string::npos)
         << command->name();
   }
-  for (const Syntax::OptionInfo& o : GlobalSyntax().options()) {
+  Syntax globals;
+  DeclareGlobalOptions(globals);
+  for (const Syntax::OptionInfo& o : globals.options()) {
     EXPECT_NE(completion.find(o.names.back()), std::string::npos) << o.names.back();
   }
 }
